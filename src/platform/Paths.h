@@ -1,0 +1,32 @@
+#pragma once
+// Where things live on a Linux desktop. The program's own files (data.pkg, ctt) are found from
+// the executable's path; the user's files follow the XDG base directory rules.
+//
+// Thread contract: any thread. Results are computed from the environment at each call, so a
+// test may point them elsewhere with setenv before it starts its work.
+
+#include <string>
+
+namespace ac::platform {
+
+// Directory of the running executable, from /proc/self/exe.
+std::string ExecutableDirectory();
+
+// The directory that holds data.pkg: AUDIOCONV_BASEDIR if set; the executable's directory when
+// data.pkg lies there (the build tree); else <exe>/../share/audio-converter (installed).
+std::string FindBaseDirectory();
+
+// $XDG_DATA_HOME/audio-converter (default ~/.local/share/audio-converter): user.pkg, CDDB,
+// lang_miss.txt. Not created here.
+std::string UserDataDirectory();
+
+// $XDG_CONFIG_HOME/audio-converter (default ~/.config/audio-converter): settings.ini.
+std::string UserConfigDirectory();
+
+// The user's music folder (XDG user-dirs MUSIC), else ~/Music.
+std::string MusicDirectory();
+
+// Creates a directory and its parents (mode 0700 for new ones under the user's home).
+bool EnsureDirectory(const std::string& path);
+
+}  // namespace ac::platform
