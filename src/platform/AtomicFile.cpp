@@ -4,8 +4,12 @@
 #include <sys/stat.h>
 #include <unistd.h>
 
+#include <dirent.h>
+#include <signal.h>
+
 #include <cerrno>
 #include <cstdio>
+#include <cstdlib>
 #include <ctime>
 #include <random>
 
@@ -112,6 +116,27 @@ bool WriteFileAtomically(const std::string& path, std::string_view contents) {
         ::fsync(dir.Get());
     }
     return true;
+}
+
+void RemoveStaleTemporaries(const std::string& path) {
+    std::string directory = DirectoryOf(path);
+    std::string prefix = path.substr(path.find_last_of('/') + 1) + ".tmp-";
+    DIR* folder = ::opendir(directory.c_str());
+    if (folder == nullptr) {
+        return;
+    }
+    while (dirent* entry = ::readdir(folder)) {
+        std::string_view name(entry->d_name);
+        if (name.substr(0, prefix.size()) != prefix) {
+            continue;
+        }
+        // "<name>.tmp-<pid>-<random>": remove it only when that process is gone.
+        long pid = std::strtol(entry->d_name + prefix.size(), nullptr, 10);
+        if (pid > 0 && ::kill(static_cast<pid_t>(pid), 0) != 0 && errno == ESRCH) {
+            ::unlink((directory + "/" + std::string(name)).c_str());
+        }
+    }
+    ::closedir(folder);
 }
 
 std::string SetAsideDamagedFile(const std::string& path) {

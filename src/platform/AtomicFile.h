@@ -19,6 +19,10 @@ ReadResult ReadWholeFile(const std::string& path, std::string& contents, std::si
 // file keeps the permission bits of the one it replaces (0644 for a new one, masked by umask).
 bool WriteFileAtomically(const std::string& path, std::string_view contents);
 
+// Removes temporaries that WriteFileAtomically left beside path when its process died between
+// writing and renaming. Temporaries of live processes are left alone.
+void RemoveStaleTemporaries(const std::string& path);
+
 // Moves a file aside as "<path>.damaged-YYYYMMDD-HHMMSS" so the user can still recover it.
 // Answers the new name, or an empty string if the move failed.
 std::string SetAsideDamagedFile(const std::string& path);

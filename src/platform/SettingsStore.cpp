@@ -12,6 +12,7 @@
 #include <cerrno>
 #include <charconv>
 #include <climits>
+#include <utility>
 
 namespace ac::platform {
 namespace {
@@ -308,6 +309,10 @@ bool SettingsStore::Write(std::string_view key, std::string_view name, const Set
         return false;
     }
     FileLock fileLock(m_filePath + ".lock");
+    if (!m_sweptTemporaries) {
+        RemoveStaleTemporaries(m_filePath);
+        m_sweptTemporaries = true;
+    }
     LoadLocked();
 
     Line entry;

@@ -69,6 +69,7 @@ private:
     std::vector<Line> m_lines;
     std::optional<FileIdentity> m_loadedIdentity;
     std::string m_setAsideNotice;
+    bool m_sweptTemporaries = false;
 };
 
 // Text form of values in the file; exposed for tests and the fuzzer.
