@@ -42,40 +42,47 @@ std::string_view Trim(std::string_view text) {
     return text;
 }
 
+// Length of the well-formed UTF-8 sequence that starts at text[i], or 0 if there is none.
+std::size_t Utf8SequenceLength(std::string_view text, std::size_t i) {
+    auto byte = static_cast<unsigned char>(text[i]);
+    std::size_t extra = 0;
+    std::uint32_t codePoint = 0;
+    if (byte < 0x80) {
+        return 1;
+    } else if ((byte & 0xE0) == 0xC0) {
+        extra = 1, codePoint = byte & 0x1F;
+    } else if ((byte & 0xF0) == 0xE0) {
+        extra = 2, codePoint = byte & 0x0F;
+    } else if ((byte & 0xF8) == 0xF0) {
+        extra = 3, codePoint = byte & 0x07;
+    } else {
+        return 0;
+    }
+    if (i + extra >= text.size()) {
+        return 0;
+    }
+    for (std::size_t k = 1; k <= extra; ++k) {
+        auto next = static_cast<unsigned char>(text[i + k]);
+        if ((next & 0xC0) != 0x80) {
+            return 0;
+        }
+        codePoint = (codePoint << 6) | (next & 0x3F);
+    }
+    static constexpr std::uint32_t kMinimum[] = {0, 0x80, 0x800, 0x10000};
+    if (codePoint < kMinimum[extra] || codePoint > 0x10FFFF ||
+        (codePoint >= 0xD800 && codePoint <= 0xDFFF)) {
+        return 0;
+    }
+    return extra + 1;
+}
+
 bool IsValidUtf8(std::string_view text) {
-    std::size_t i = 0;
-    while (i < text.size()) {
-        auto byte = static_cast<unsigned char>(text[i]);
-        std::size_t extra = 0;
-        std::uint32_t codePoint = 0;
-        if (byte < 0x80) {
-            ++i;
-            continue;
-        } else if ((byte & 0xE0) == 0xC0) {
-            extra = 1, codePoint = byte & 0x1F;
-        } else if ((byte & 0xF0) == 0xE0) {
-            extra = 2, codePoint = byte & 0x0F;
-        } else if ((byte & 0xF8) == 0xF0) {
-            extra = 3, codePoint = byte & 0x07;
-        } else {
+    for (std::size_t i = 0; i < text.size();) {
+        std::size_t length = Utf8SequenceLength(text, i);
+        if (length == 0) {
             return false;
         }
-        if (i + extra >= text.size()) {
-            return false;
-        }
-        for (std::size_t k = 1; k <= extra; ++k) {
-            auto next = static_cast<unsigned char>(text[i + k]);
-            if ((next & 0xC0) != 0x80) {
-                return false;
-            }
-            codePoint = (codePoint << 6) | (next & 0x3F);
-        }
-        static constexpr std::uint32_t kMinimum[] = {0, 0x80, 0x800, 0x10000};
-        if (codePoint < kMinimum[extra] || codePoint > 0x10FFFF ||
-            (codePoint >= 0xD800 && codePoint <= 0xDFFF)) {
-            return false;
-        }
-        i += extra + 1;
+        i += length;
     }
     return true;
 }
@@ -112,21 +119,34 @@ private:
 
 }  // namespace
 
+// Besides control characters, bytes that are not UTF-8 (a Latin-1 file name, say) are written
+// as \xHH: the file must stay valid text, or the next start would set it all aside.
 std::string EscapeSettingText(std::string_view text) {
     static constexpr char kHex[] = "0123456789ABCDEF";
+    auto hex = [&](std::string& out, unsigned char c) {
+        out += "\\x";
+        out += kHex[c >> 4];
+        out += kHex[c & 0xF];
+    };
     std::string out;
     out.reserve(text.size());
-    for (char c : text) {
+    for (std::size_t i = 0; i < text.size();) {
+        char c = text[i];
+        std::size_t length = Utf8SequenceLength(text, i);
+        if (length > 1) {
+            out.append(text.substr(i, length));
+            i += length;
+            continue;
+        }
+        ++i;
         switch (c) {
             case '\\': out += "\\\\"; break;
             case '\n': out += "\\n"; break;
             case '\r': out += "\\r"; break;
             case '\t': out += "\\t"; break;
             default:
-                if (static_cast<unsigned char>(c) < 0x20 || c == 0x7F) {
-                    out += "\\x";
-                    out += kHex[(static_cast<unsigned char>(c) >> 4) & 0xF];
-                    out += kHex[static_cast<unsigned char>(c) & 0xF];
+                if (length == 0 || static_cast<unsigned char>(c) < 0x20 || c == 0x7F) {
+                    hex(out, static_cast<unsigned char>(c));
                 } else {
                     out += c;
                 }
@@ -300,7 +320,8 @@ bool SettingsStore::WriteString(std::string_view key, std::string_view name,
 
 bool SettingsStore::Write(std::string_view key, std::string_view name, const SettingValue& value) {
     if (key.empty() || name.empty() || name.find_first_of("=\n\r[") != std::string_view::npos ||
-        key.find_first_of("]\n\r") != std::string_view::npos) {
+        key.find_first_of("]\n\r") != std::string_view::npos || !IsValidUtf8(key) ||
+        !IsValidUtf8(name)) {
         return false;
     }
     std::lock_guard lock(m_mutex);

@@ -35,7 +35,9 @@ protected:
 };
 
 TEST_F(SettingsStoreTest, ValuesSurviveAReopenWithTheirTypesAndEveryCharacter) {
-    const std::string awkward = "C:\\Temp\\a\tb\nc\rd \x01 end \xC3\xA4\xE2\x82\xAC";
+    // Control characters, UTF-8, and Latin-1 bytes that are no UTF-8 (a file name from disk).
+    const std::string awkward =
+        "C:\\Temp\\a\tb\nc\rd \x01 end \xC3\xA4\xE2\x82\xAC M\xFCsik \xC3";
     {
         SettingsStore store(file);
         ASSERT_TRUE(store.WriteInt(kKey, "max_processes", -7));
@@ -54,8 +56,9 @@ TEST_F(SettingsStoreTest, ValuesSurviveAReopenWithTheirTypesAndEveryCharacter) {
     EXPECT_EQ(reopened.Read(kKey, "empty")->text, "");
     EXPECT_FALSE(reopened.Read(kKey, "missing"));
     EXPECT_FALSE(reopened.Read("Software\\Other", "OutputDir"));
-    // One line per value: an escaped newline must not split the entry.
+    // One line per value, and the file stays valid text that the next start will accept.
     EXPECT_EQ(FileText(file).find("\nc\r"), std::string::npos);
+    EXPECT_TRUE(reopened.TakeSetAsideNotice().empty());
 }
 
 TEST_F(SettingsStoreTest, UnreadableEntriesAreOtherTypeAndForeignLinesAreKept) {
