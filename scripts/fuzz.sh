@@ -1,0 +1,25 @@
+#!/usr/bin/env bash
+# Builds the libFuzzer targets with clang and runs each for SECONDS (default 60).
+set -euo pipefail
+top=$(cd "$(dirname "$0")/.." && pwd)
+seconds=${1:-60}
+build=${BUILD_DIR:-$top/build-fuzz}
+CC=clang CXX=clang++ cmake -S "$top" -B "$build" -G Ninja -DAC_FUZZ=ON -DAC_BUILD_TESTS=OFF \
+  -DAC_BUILD_BENCH=OFF -DAC_WERROR=OFF >/dev/null
+cmake --build "$build" -j "${JOBS:-2}" --target $(cd "$top/tests/fuzz" && ls fuzz_*.cpp | sed 's/\.cpp$//')
+mkdir -p "$build/findings"
+for src in "$top"/tests/fuzz/fuzz_*.cpp; do
+  name=$(basename "$src" .cpp)
+  corpus="$build/corpus/$name"
+  mkdir -p "$corpus"
+  seeds="$top/tests/fuzz/seeds/${name#fuzz_}"
+  echo "== $name for ${seconds}s"
+  "$build/bin/$name" -max_total_time="$seconds" -max_len=65536 -timeout=10 \
+    -artifact_prefix="$build/findings/$name-" "$corpus" $( [ -d "$seeds" ] && echo "$seeds" ) \
+    2>&1 | grep -E '^(#[0-9]+ +DONE|==|SUMMARY|Done)' || true
+done
+if ls "$build/findings"/* >/dev/null 2>&1; then
+  echo "fuzz: findings in $build/findings" >&2
+  exit 1
+fi
+echo "fuzz: no findings"
