@@ -40,6 +40,9 @@ std::string PackageFileOnDisk(std::string_view packagePath);
 // missing or is no readable Zip archive.
 std::shared_ptr<ZipArchive> OpenPackage(std::string_view path);
 void ClosePackage(std::string_view path);
+// The archive the open table holds for the package named in the path, without opening one:
+// lets a cache tell whether the archive it read from is still the current one.
+std::shared_ptr<ZipArchive> FindOpenPackage(std::string_view path);
 
 bool ResourceExists(std::string_view path);
 // Reads a whole entry. False for a missing package or entry, an entry above kMaxEntrySize,
