@@ -2,6 +2,7 @@
 
 #include <algorithm>
 #include <array>
+#include <iterator>
 
 namespace ac {
 namespace {
@@ -22,7 +23,7 @@ std::string_view Find(std::span<const BuiltinStringEntry> table, std::uint32_t i
 }
 
 #define AC_STRING(id, text) BuiltinStringEntry{id, text},
-constexpr std::array kStrings{
+constexpr BuiltinStringEntry kStrings[] = {
 #include "resources/StringTable.inc"
 };
 #undef AC_STRING
@@ -31,13 +32,14 @@ static_assert(StrictlyAscending(kStrings), "StringTable.inc must be sorted by id
 // The menu table is written menu by menu in walk order, which is how a translator reads it;
 // lookups want it by key.
 #define AC_MENU_TEXT(key, text) BuiltinStringEntry{key, text},
-constexpr std::array kMenuTextsInWalkOrder{
+constexpr BuiltinStringEntry kMenuTextsInWalkOrder[] = {
 #include "resources/MenuTextTable.inc"
 };
 #undef AC_MENU_TEXT
 
 constexpr auto kMenuTexts = [] {
-    auto sorted = kMenuTextsInWalkOrder;
+    std::array<BuiltinStringEntry, std::size(kMenuTextsInWalkOrder)> sorted{};
+    std::copy(std::begin(kMenuTextsInWalkOrder), std::end(kMenuTextsInWalkOrder), sorted.begin());
     std::sort(sorted.begin(), sorted.end(),
               [](const auto& a, const auto& b) { return a.id < b.id; });
     return sorted;
