@@ -420,7 +420,10 @@ void NoteLanguageMiss(LanguageTextKind kind, std::uint32_t id, std::string_view 
     std::fclose(file);
 }
 
-ImLanguage::ImLanguage() : m_tables(std::make_shared<const LanguageTables>()) {}
+ImLanguage::ImLanguage() {
+    m_tableSets.push_back(std::make_unique<const LanguageTables>());
+    m_tables.store(m_tableSets.back().get(), std::memory_order_release);
+}
 
 ImLanguage::~ImLanguage() = default;
 
@@ -446,8 +449,8 @@ void ImLanguage::ScanLanguages() {
 }
 
 bool ImLanguage::SelectLanguage(const std::string& name) {
-    const auto previous = Tables();
-    auto next = std::make_shared<LanguageTables>();
+    const LanguageTables* previous = Tables();
+    auto next = std::make_unique<LanguageTables>();
     next->codePage = previous->codePage;
     next->subLang = previous->subLang;
     next->language = previous->language;
@@ -463,7 +466,8 @@ bool ImLanguage::SelectLanguage(const std::string& name) {
     // The archive finds the entry whatever the case of the name, so the file loads in either
     // case; only the name shown depends on the scan.
     const bool loaded = Load(name, *next);
-    m_tables.store(std::move(next));
+    m_tableSets.push_back(std::move(next));
+    m_tables.store(m_tableSets.back().get(), std::memory_order_release);
     if (!loaded) {
         if (!EqualsNoCase(name, "English")) {
             SelectLanguage("English");
@@ -500,7 +504,7 @@ void ImLanguage::ApplyLocale() const {
 }
 
 std::string ImLanguage::GetString(std::uint32_t id) const {
-    const auto tables = Tables();
+    const LanguageTables* tables = Tables();
     const std::string* text = FindLanguageText(tables->strings, id);
     if (text && !text->empty()) {
         return *text;
@@ -511,13 +515,13 @@ std::string ImLanguage::GetString(std::uint32_t id) const {
 }
 
 std::string ImLanguage::GetMenuText(std::uint32_t key) const {
-    const auto tables = Tables();
+    const LanguageTables* tables = Tables();
     const std::string* text = FindLanguageText(tables->menuTexts, key);
     return text ? *text : std::string();
 }
 
 std::string ImLanguage::GetDialogText(std::uint32_t key) const {
-    const auto tables = Tables();
+    const LanguageTables* tables = Tables();
     const std::string* text = FindLanguageText(tables->dialogTexts, key);
     return text ? *text : std::string();
 }

@@ -132,14 +132,17 @@ public:
     }
 
 private:
-    std::shared_ptr<const LanguageTables> Tables() const { return m_tables.load(); }
+    const LanguageTables* Tables() const { return m_tables.load(std::memory_order_acquire); }
     bool Load(const std::string& name, LanguageTables& tables) const;
     void ApplyLocale() const;
     std::string DecorateCommandText(int command, const std::string& text) const;
 
     std::string m_strLanguage = "english";
     std::vector<std::string> m_languages;
-    std::atomic<std::shared_ptr<const LanguageTables>> m_tables;
+    // The active tables. Replaced sets are kept, not freed: a worker thread may still be
+    // reading one, and a switch is a click in the language menu, so they stay few.
+    std::atomic<const LanguageTables*> m_tables;
+    std::vector<std::unique_ptr<const LanguageTables>> m_tableSets;
     std::string m_strBaseDir;
     int m_contentsCommand = 0;
     int m_aboutCommand = 0;
