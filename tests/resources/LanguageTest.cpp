@@ -119,25 +119,11 @@ TEST(ParseFileTest, Cp936TrailByteIsNoEscape) {
     EXPECT_EQ(tables.codePage, 936);
 }
 
-TEST(ParseFileTest, Cp932TrailByteIsNoEscape) {
-    LanguageTables tables;
-    tables.codePage = 932;  // kept from the file before
-    ParseLanguageFile({"#0001# \"\x95\x5Ct\""}, tables);
-    EXPECT_EQ(*FindLanguageText(tables.strings, 1), "\xE8\xA1\xA8t");  // U+8868, then 't'
-}
-
 TEST(ParseFileTest, ByteOrderMarkIsDroppedAndMeansUtf8) {
     LanguageTables tables;
     ParseLanguageFile({"\xEF\xBB\xBFLANGCODE=fr", "#0001# \"\xC3\xA9t\xC3\xA9\""}, tables);
     EXPECT_EQ(tables.langCode, "fr");
     EXPECT_EQ(*FindLanguageText(tables.strings, 1), "\xC3\xA9t\xC3\xA9");
-}
-
-TEST(ParseFileTest, InvalidBytesBecomeReplacementCharacters) {
-    LanguageTables tables;
-    ParseLanguageFile({"CODEPAGE=936", "#0001# \"a\x81\"", "#0002# \"\xFF\x81\""}, tables);
-    EXPECT_EQ(*FindLanguageText(tables.strings, 1), "a\xEF\xBF\xBD");
-    EXPECT_EQ(*FindLanguageText(tables.strings, 2), "\xEF\xBF\xBD\xEF\xBF\xBD");
 }
 
 TEST(FormatTest, LinesInLanguageFileForm) {
