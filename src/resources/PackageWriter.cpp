@@ -26,29 +26,112 @@ constexpr zip_uint32_t kUnixDirectoryMode = 040755u;
 // last entry asked for.
 constexpr unsigned char kEmptyArchive[22] = {0x50, 0x4b, 0x05, 0x06};
 
-bool ReadWholeSource(zip_source_t* source, std::string& bytes) {
-    bytes.clear();
-    if (zip_source_open(source) < 0) {
-        return false;
-    }
-    char chunk[65536];
-    bool ok = true;
-    for (;;) {
-        zip_int64_t got = zip_source_read(source, chunk, sizeof chunk);
-        if (got < 0) {
-            ok = false;
-            break;
-        }
-        if (got == 0) {
-            break;
-        }
-        bytes.append(chunk, static_cast<std::size_t>(got));
-    }
-    zip_source_close(source);
-    return ok;
-}
-
 }  // namespace
+
+// The archive's bytes as a libzip source that can be read and rewritten in memory. libzip's own
+// buffer source is not used: when a change only appends, libzip 1.7 "clones" the old buffer and
+// then frees memory it was told it does not own. This source offers no cloning, so every
+// rewrite goes to a fresh string and the old bytes stay untouched until the commit.
+struct PackageWriter::MemoryArchive {
+    std::string data;     // the archive as it stands
+    std::string pending;  // the archive zip_close is writing
+    std::size_t readOffset = 0;
+    std::size_t writeOffset = 0;
+    zip_error_t error;
+
+    static zip_int64_t Callback(void* state, void* data, zip_uint64_t length,
+                                zip_source_cmd_t command);
+};
+
+zip_int64_t PackageWriter::MemoryArchive::Callback(void* state, void* data, zip_uint64_t length,
+                                                   zip_source_cmd_t command) {
+    auto* self = static_cast<MemoryArchive*>(state);
+    switch (command) {
+        case ZIP_SOURCE_SUPPORTS:
+            return ZIP_SOURCE_SUPPORTS_WRITABLE |
+                   ZIP_SOURCE_MAKE_COMMAND_BITMASK(ZIP_SOURCE_ACCEPT_EMPTY);
+        case ZIP_SOURCE_ACCEPT_EMPTY:
+            return 1;
+        case ZIP_SOURCE_OPEN:
+            self->readOffset = 0;
+            return 0;
+        case ZIP_SOURCE_READ: {
+            std::size_t left = self->data.size() - std::min(self->readOffset, self->data.size());
+            auto count = static_cast<std::size_t>(std::min<zip_uint64_t>(length, left));
+            std::memcpy(data, self->data.data() + self->readOffset, count);
+            self->readOffset += count;
+            return static_cast<zip_int64_t>(count);
+        }
+        case ZIP_SOURCE_CLOSE:
+            return 0;
+        case ZIP_SOURCE_STAT: {
+            if (length < sizeof(zip_stat_t)) {
+                zip_error_set(&self->error, ZIP_ER_INVAL, 0);
+                return -1;
+            }
+            auto* stat = static_cast<zip_stat_t*>(data);
+            zip_stat_init(stat);
+            stat->size = self->data.size();
+            stat->valid = ZIP_STAT_SIZE;
+            return sizeof(zip_stat_t);
+        }
+        case ZIP_SOURCE_ERROR:
+            return zip_error_to_data(&self->error, data, length);
+        case ZIP_SOURCE_FREE:
+            zip_error_fini(&self->error);
+            delete self;
+            return 0;
+        case ZIP_SOURCE_SEEK: {
+            zip_int64_t offset = zip_source_seek_compute_offset(self->readOffset, self->data.size(),
+                                                                data, length, &self->error);
+            if (offset < 0) {
+                return -1;
+            }
+            self->readOffset = static_cast<std::size_t>(offset);
+            return 0;
+        }
+        case ZIP_SOURCE_TELL:
+            return static_cast<zip_int64_t>(self->readOffset);
+        case ZIP_SOURCE_BEGIN_WRITE:
+            self->pending.clear();
+            self->writeOffset = 0;
+            return 0;
+        case ZIP_SOURCE_WRITE: {
+            auto count = static_cast<std::size_t>(length);
+            if (self->writeOffset + count > self->pending.size()) {
+                self->pending.resize(self->writeOffset + count);
+            }
+            std::memcpy(self->pending.data() + self->writeOffset, data, count);
+            self->writeOffset += count;
+            return static_cast<zip_int64_t>(count);
+        }
+        case ZIP_SOURCE_SEEK_WRITE: {
+            zip_int64_t offset = zip_source_seek_compute_offset(
+                self->writeOffset, self->pending.size(), data, length, &self->error);
+            if (offset < 0) {
+                return -1;
+            }
+            self->writeOffset = static_cast<std::size_t>(offset);
+            return 0;
+        }
+        case ZIP_SOURCE_TELL_WRITE:
+            return static_cast<zip_int64_t>(self->writeOffset);
+        case ZIP_SOURCE_COMMIT_WRITE:
+            self->data = std::move(self->pending);
+            self->pending.clear();
+            self->readOffset = 0;
+            return 0;
+        case ZIP_SOURCE_ROLLBACK_WRITE:
+            self->pending.clear();
+            return 0;
+        case ZIP_SOURCE_REMOVE:
+            self->data.clear();
+            return 0;
+        default:
+            zip_error_set(&self->error, ZIP_ER_OPNOTSUPP, 0);
+            return -1;
+    }
+}
 
 PackageWriter::~PackageWriter() {
     Discard();
@@ -63,7 +146,7 @@ void PackageWriter::Discard() {
         zip_source_free(m_source);
         m_source = nullptr;
     }
-    m_original.clear();
+    m_memory = nullptr;
     m_entries.clear();
     m_liveCount = 0;
 }
@@ -115,41 +198,38 @@ PackageWriter::OpenResult PackageWriter::Open(const std::string& filePath) {
 
 PackageWriter::OpenResult PackageWriter::OpenFromMemory(std::string bytes) {
     Discard();
-    m_original = std::move(bytes);
-    zip_error_t error;
-    zip_error_init(&error);
-    zip_source_t* source =
-        zip_source_buffer_create(m_original.data(), m_original.size(), 0, &error);
-    zip_error_fini(&error);
-    if (source == nullptr) {
-        return OpenResult::Failed;
-    }
-    return OpenSource(source);
+    return OpenMemory(std::move(bytes));
 }
 
 bool PackageWriter::Create() {
     Discard();
-    zip_error_t error;
-    zip_error_init(&error);
-    zip_source_t* source = zip_source_buffer_create(nullptr, 0, 0, &error);
-    zip_error_fini(&error);
-    return source != nullptr && OpenSource(source) == OpenResult::Ok;
+    return OpenMemory(std::string()) == OpenResult::Ok;
 }
 
-PackageWriter::OpenResult PackageWriter::OpenSource(zip_source_t* source) {
+PackageWriter::OpenResult PackageWriter::OpenMemory(std::string bytes) {
+    auto* memory = new MemoryArchive;
+    memory->data = std::move(bytes);
+    zip_error_init(&memory->error);
     zip_error_t error;
     zip_error_init(&error);
+    zip_source_t* source = zip_source_function_create(&MemoryArchive::Callback, memory, &error);
+    if (source == nullptr) {
+        zip_error_fini(&error);
+        zip_error_fini(&memory->error);
+        delete memory;
+        return OpenResult::Failed;
+    }
     m_zip = zip_open_from_source(source, 0, &error);
     zip_error_fini(&error);
     if (m_zip == nullptr) {
-        zip_source_free(source);
-        m_original.clear();
+        zip_source_free(source);  // frees memory too
         return OpenResult::NotAnArchive;
     }
-    // The archive owns one reference; ours keeps the buffer alive past zip_close, which is
-    // where the finished archive is read back from.
+    // The archive owns one reference; ours keeps the bytes reachable past zip_close, which is
+    // where the finished archive is taken from.
     zip_source_keep(source);
     m_source = source;
+    m_memory = memory;
     zip_int64_t count = zip_get_num_entries(m_zip, 0);
     for (zip_int64_t index = 0; index < count; ++index) {
         if (const char* name = zip_get_name(m_zip, static_cast<zip_uint64_t>(index), 0)) {
@@ -309,9 +389,9 @@ bool PackageWriter::Finish(std::string& bytes) {
         return false;
     }
     m_zip = nullptr;
-    bool ok = ReadWholeSource(m_source, bytes);
+    bytes = std::move(m_memory->data);
     Discard();
-    return ok;
+    return true;
 }
 
 bool PackageWriter::Commit(const std::string& filePath) {

@@ -65,16 +65,18 @@ public:
     static std::string StoredName(std::string_view name);
 
 private:
-    OpenResult OpenSource(struct zip_source* source);
+    OpenResult OpenMemory(std::string bytes);
     void Discard();
     bool SetAttributes(std::uint64_t index, bool directory, std::time_t mtime);
     std::vector<std::uint64_t> Matches(std::string_view name) const;
     bool DeleteAll(std::string_view name);
     void Remember(const std::string& name, std::uint64_t index);
 
+    struct MemoryArchive;
+
     struct zip* m_zip = nullptr;
     struct zip_source* m_source = nullptr;
-    std::string m_original;  // the buffer m_source reads the old archive from
+    MemoryArchive* m_memory = nullptr;  // owned by m_source: the old archive, then the new one
     // Live entries by lookup key, so that building a package of thousands of entries does not
     // rescan the archive at every addition.
     std::unordered_map<std::string, std::vector<std::uint64_t>> m_entries;

@@ -138,7 +138,8 @@ TEST(IniSplit, OnlyCrLfEndsALine) {
     EXPECT_EQ(ini.Lines(), (std::vector<std::string>{"a", "", "b\rc", "last"}));
     ini.LoadFromText("a\r\n");
     EXPECT_EQ(ini.Lines(), (std::vector<std::string>{"a"}));
-    ini.LoadFromText(std::string("[S]\r\nK=1\r\n\0[T]\r\nK=2\r\n", 24));
+    using namespace std::string_literals;
+    ini.LoadFromText("[S]\r\nK=1\r\n\0[T]\r\nK=2\r\n"s);
     EXPECT_EQ(ini.Lines().size(), 2u);
     ini.LoadFromText("");
     EXPECT_TRUE(ini.Lines().empty());
