@@ -76,7 +76,7 @@ bool PlainPathExists(std::string_view path) {
         struct stat st {};
         return ::stat(disk.c_str(), &st) == 0;
     }
-    glob_t matches {};
+    glob_t matches{};
     int result = ::glob(disk.c_str(), GLOB_NOSORT | GLOB_NOESCAPE, nullptr, &matches);
     bool found = result == 0 && matches.gl_pathc > 0;
     ::globfree(&matches);

@@ -243,8 +243,7 @@ bool PackageWriter::Has(std::string_view name) const {
     return m_zip != nullptr && m_entries.count(ZipArchive::LookupKey(name)) != 0;
 }
 
-bool PackageWriter::Read(std::string_view name, std::string& contents,
-                         std::size_t maxSize) const {
+bool PackageWriter::Read(std::string_view name, std::string& contents, std::size_t maxSize) const {
     contents.clear();
     if (m_zip == nullptr) {
         return false;
@@ -279,8 +278,8 @@ bool PackageWriter::Read(std::string_view name, std::string& contents,
 }
 
 bool PackageWriter::SetAttributes(std::uint64_t index, bool directory, std::time_t mtime) {
-    zip_uint32_t attributes = directory ? (kUnixDirectoryMode << 16) | kDirectoryAttribute
-                                        : (kUnixFileMode << 16);
+    zip_uint32_t attributes =
+        directory ? (kUnixDirectoryMode << 16) | kDirectoryAttribute : (kUnixFileMode << 16);
     if (mtime == 0) {
         mtime = std::time(nullptr);
     }

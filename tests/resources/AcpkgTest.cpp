@@ -101,14 +101,13 @@ TEST_F(Acpkg, PackIsSortedWithFolderEntriesAndReproducible) {
     for (const ac::ZipEntry& entry : archive->Entries()) {
         names.push_back(entry.name + (entry.IsDirectory() ? " dir" : ""));
     }
-    EXPECT_EQ(names, (std::vector<std::string>{
-                         "empty\\ dir", "lang\\ dir", "lang\\English.lang", "profile\\ dir",
-                         "profile\\mp3.pf", "skin\\ dir", "skin\\Default\\ dir",
-                         "skin\\Default\\bg.bmp", "skin\\Default\\skin.ini"}));
+    EXPECT_EQ(names, (std::vector<std::string>{"empty\\ dir", "lang\\ dir", "lang\\English.lang",
+                                               "profile\\ dir", "profile\\mp3.pf", "skin\\ dir",
+                                               "skin\\Default\\ dir", "skin\\Default\\bg.bmp",
+                                               "skin\\Default\\skin.ini"}));
     EXPECT_NE(first.find("skin/Default/skin.ini"), std::string::npos);
 
-    ASSERT_EQ(Run({"pack", package, m_dir + "/src"}, "SOURCE_DATE_EPOCH=1700000000").exitCode,
-              0);
+    ASSERT_EQ(Run({"pack", package, m_dir + "/src"}, "SOURCE_DATE_EPOCH=1700000000").exitCode, 0);
     EXPECT_EQ(ReadFile(package), first);
 
     RunResult listed = Run({"list", package, "skin/Default"});
@@ -154,11 +153,9 @@ TEST_F(Acpkg, RefusesBadInputWithoutTouchingFiles) {
                   "cannot read '" + m_dir + "/missing'");
     EXPECT_FALSE(fs::exists(m_dir + "/p.pkg"));
     for (const std::vector<std::string>& args :
-         {std::vector<std::string>{}, {"list"}, {"frobnicate", "p.pkg"}, {"cat", "p.pkg"}}) {
-        RunResult result = Run(args);
-        EXPECT_EQ(result.exitCode, 1);
-        EXPECT_EQ(result.err.find("acpkg: usage:"), 0u);
-        EXPECT_EQ(std::count(result.err.begin(), result.err.end(), '\n'), 1);
+         {std::vector<std::string>{}, {"frobnicate", "p.pkg"}, {"cat", "p.pkg"}}) {
+        ExpectFailure(Run(args),
+                      "usage: acpkg list|cat|add|rm|ini-get|ini-set|pack PACKAGE [ARGUMENTS...]");
     }
 }
 

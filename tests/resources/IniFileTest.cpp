@@ -93,17 +93,13 @@ TEST_P(IniInt, ParsesLikeTheOriginalReader) {
     EXPECT_EQ(value, GetParam().expected);
 }
 
-INSTANTIATE_TEST_SUITE_P(Values, IniInt,
-                         ::testing::Values(IntCase{"0x10", 16}, IntCase{"0X1f", 31},
-                                           IntCase{"010", 10}, IntCase{"12px", 12},
-                                           IntCase{"px", 0}, IntCase{"", 0},
-                                           IntCase{"-7", -7}, IntCase{"+3", 3},
-                                           IntCase{"0xFFFFFFFF", -1},
-                                           IntCase{"0x80000000", INT_MIN},
-                                           IntCase{"0x123456789", -1},
-                                           IntCase{"99999999999", INT_MAX},
-                                           IntCase{"-99999999999", INT_MIN},
-                                           IntCase{"0xZZ", 0}, IntCase{"\"5\"", 0}));
+INSTANTIATE_TEST_SUITE_P(
+    Values, IniInt,
+    ::testing::Values(IntCase{"0x10", 16}, IntCase{"0X1f", 31}, IntCase{"010", 10},
+                      IntCase{"12px", 12}, IntCase{"px", 0}, IntCase{"", 0}, IntCase{"-7", -7},
+                      IntCase{"+3", 3}, IntCase{"0xFFFFFFFF", -1}, IntCase{"0x80000000", INT_MIN},
+                      IntCase{"0x123456789", -1}, IntCase{"99999999999", INT_MAX},
+                      IntCase{"-99999999999", INT_MIN}, IntCase{"0xZZ", 0}, IntCase{"\"5\"", 0}));
 
 TEST_F(IniText, SetValueEditsInPlaceAndInsertsBehindHeader) {
     const std::size_t before = m_ini.Lines().size();
@@ -205,18 +201,18 @@ TEST_P(IniCorpus, WritesBackUnchangedAndAcceptsEdits) {
     EXPECT_TRUE(std::equal(lines.begin(), lines.end(), ini.Lines().begin()));
 }
 
-INSTANTIATE_TEST_SUITE_P(
-    Files, IniCorpus,
-    ::testing::Values("inih_bad_section.ini", "inih_bom.ini", "inih_duplicate_sections.ini",
-                      "inih_multi_line.ini", "inih_no_value_crlf.ini", "inih_normal.ini",
-                      "iniparser_quotes.ini", "iniparser_spaced2.ini", "iniparser_twisted.ini",
-                      "simpleini_tests_utf8_bom.ini", "twin_win.ini",
-                      "windows-sys-backup_system.ini"),
-    [](const auto& info) {
-        std::string name = info.param.substr(0, info.param.find('.'));
-        std::replace(name.begin(), name.end(), '-', '_');
-        return name;
-    });
+INSTANTIATE_TEST_SUITE_P(Files, IniCorpus,
+                         ::testing::Values("inih_bad_section.ini", "inih_bom.ini",
+                                           "inih_duplicate_sections.ini", "inih_multi_line.ini",
+                                           "inih_no_value_crlf.ini", "inih_normal.ini",
+                                           "iniparser_quotes.ini", "iniparser_spaced2.ini",
+                                           "iniparser_twisted.ini", "simpleini_tests_utf8_bom.ini",
+                                           "twin_win.ini", "windows-sys-backup_system.ini"),
+                         [](const auto& info) {
+                             std::string name = info.param.substr(0, info.param.find('.'));
+                             std::replace(name.begin(), name.end(), '-', '_');
+                             return name;
+                         });
 
 // The package doors: buffer rules of ReadIniString, the cache, and CR LF texts from a real
 // system.ini served out of a package.

@@ -112,7 +112,8 @@ int List(const std::string& package, const std::string* folder) {
     }
     std::vector<std::string> names;
     for (const ac::ZipEntry& entry : archive->Entries()) {
-        if (entry.name.size() > prefix.size() && entry.name.compare(0, prefix.size(), prefix) == 0) {
+        if (entry.name.size() > prefix.size() &&
+            entry.name.compare(0, prefix.size(), prefix) == 0) {
             names.push_back(entry.name);
         }
     }
