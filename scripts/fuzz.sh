@@ -6,13 +6,20 @@ seconds=${1:-60}
 build=${BUILD_DIR:-$top/build-fuzz}
 CC=clang CXX=clang++ cmake -S "$top" -B "$build" -G Ninja -DAC_FUZZ=ON -DAC_BUILD_TESTS=OFF \
   -DAC_BUILD_BENCH=OFF -DAC_WERROR=OFF >/dev/null
-cmake --build "$build" -j "${JOBS:-2}" --target $(cd "$top/tests/fuzz" && ls fuzz_*.cpp | sed 's/\.cpp$//')
+cmake --build "$build" -j "${JOBS:-2}" --target data_pkg \
+  $(cd "$top/tests/fuzz" && ls fuzz_*.cpp | sed 's/\.cpp$//')
 mkdir -p "$build/findings"
 for src in "$top"/tests/fuzz/fuzz_*.cpp; do
   name=$(basename "$src" .cpp)
   corpus="$build/corpus/$name"
   mkdir -p "$corpus"
-  seeds="$top/tests/fuzz/seeds/${name#fuzz_}"
+  case "$name" in
+    fuzz_ini|fuzz_settings) seeds="$top/../shared/corpus/ini" ;;
+    fuzz_language) seeds="$top/data/lang" ;;
+    fuzz_package) seeds="$build/seeds/package"
+      mkdir -p "$seeds" && cp -f "$build/bin/data.pkg" "$seeds/" 2>/dev/null || true ;;
+    *) seeds="" ;;
+  esac
   echo "== $name for ${seconds}s"
   "$build/bin/$name" -max_total_time="$seconds" -max_len=65536 -timeout=10 \
     -artifact_prefix="$build/findings/$name-" "$corpus" $( [ -d "$seeds" ] && echo "$seeds" ) \

@@ -56,6 +56,8 @@ int main(int argc, char** argv) {
            "// Copy it under a new name, set CODEPAGE to the code page you save in, and\n"
            "// translate the quoted texts. Lines you leave out show in English.\n";
     WriteLines(out, ac::BuiltinStrings(), "#%04X#");
+    out << "// Menus: keyed by command id; a menu bar's captions in one line keyed by its id.\n";
+    WriteLines(out, ac::BuiltinMenuTexts(), "#M%04X#");
     out.close();
     if (!out) {
         std::fprintf(stderr, "mklang: cannot write '%s'\n", argv[1]);
