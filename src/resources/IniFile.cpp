@@ -1,6 +1,7 @@
 #include "resources/IniFile.h"
 
 #include "resources/Package.h"
+#include "resources/TextScan.h"
 #include "resources/ZipArchive.h"
 
 #include <atomic>
@@ -28,49 +29,12 @@ std::string_view TrimKeyOrValue(std::string_view text) {
     return TrimChar(TrimChar(text, ' '), '\t');
 }
 
-bool IsWhiteSpace(char c) {
-    return c == ' ' || c == '\t' || c == '\r' || c == '\n' || c == '\v' || c == '\f';
-}
-
-bool EqualsIgnoringCase(std::string_view a, std::string_view b) {
-    if (a.size() != b.size()) {
-        return false;
-    }
-    for (std::size_t i = 0; i < a.size(); ++i) {
-        char x = a[i];
-        char y = b[i];
-        if (x >= 'A' && x <= 'Z') {
-            x = static_cast<char>(x - 'A' + 'a');
-        }
-        if (y >= 'A' && y <= 'Z') {
-            y = static_cast<char>(y - 'A' + 'a');
-        }
-        if (x != y) {
-            return false;
-        }
-    }
-    return true;
-}
-
-int HexValue(char c) {
-    if (c >= '0' && c <= '9') {
-        return c - '0';
-    }
-    if (c >= 'a' && c <= 'f') {
-        return c - 'a' + 10;
-    }
-    if (c >= 'A' && c <= 'F') {
-        return c - 'A' + 10;
-    }
-    return -1;
-}
-
 // Colours are written as 0xAARRGGBB, so 32 bits are kept and the top bit makes the result
 // negative; longer numbers saturate as strtoul does.
 int ParseHex(std::string_view digits) {
     std::uint32_t value = 0;
     for (char c : digits) {
-        int digit = HexValue(c);
+        int digit = HexDigitValue(c);
         if (digit < 0) {
             break;
         }
@@ -83,29 +47,6 @@ int ParseHex(std::string_view digits) {
     return static_cast<int>(value);
 }
 
-int ParseDecimal(std::string_view text) {
-    std::size_t pos = 0;
-    while (pos < text.size() && IsWhiteSpace(text[pos])) {
-        ++pos;
-    }
-    bool negative = false;
-    if (pos < text.size() && (text[pos] == '+' || text[pos] == '-')) {
-        negative = text[pos] == '-';
-        ++pos;
-    }
-    long long value = 0;
-    for (; pos < text.size() && text[pos] >= '0' && text[pos] <= '9'; ++pos) {
-        value = value * 10 + (text[pos] - '0');
-        if (value > static_cast<long long>(INT_MAX) + 1) {
-            value = static_cast<long long>(INT_MAX) + 1;
-        }
-    }
-    if (negative) {
-        return static_cast<int>(-value);
-    }
-    return value > INT_MAX ? INT_MAX : static_cast<int>(value);
-}
-
 }  // namespace
 
 std::size_t IniLoadCount() {
@@ -113,10 +54,10 @@ std::size_t IniLoadCount() {
 }
 
 std::string CleanIniValue(std::string_view value) {
-    while (!value.empty() && IsWhiteSpace(value.front())) {
+    while (!value.empty() && IsAsciiSpace(value.front())) {
         value.remove_prefix(1);
     }
-    while (!value.empty() && IsWhiteSpace(value.back())) {
+    while (!value.empty() && IsAsciiSpace(value.back())) {
         value.remove_suffix(1);
     }
     return std::string(TrimChar(value, '"'));
@@ -191,7 +132,7 @@ bool ImIniFile::GetIntValue(const char* section, const char* key, int& value) co
     if (text.size() >= 2 && text[0] == '0' && (text[1] == 'x' || text[1] == 'X')) {
         value = ParseHex(std::string_view(text).substr(2));
     } else {
-        value = ParseDecimal(text);
+        value = ReadAtoi(text);
     }
     return true;
 }

@@ -5,6 +5,7 @@
 #include "resources/CodePage.h"
 #include "resources/LanguageUi.h"
 #include "resources/Package.h"
+#include "resources/TextScan.h"
 
 #include <algorithm>
 #include <cinttypes>
@@ -22,63 +23,11 @@ namespace {
 
 constexpr std::string_view kUtf8Bom = "\xEF\xBB\xBF";
 
-bool IsSpace(char c) {
-    return c == ' ' || c == '\t' || c == '\n' || c == '\v' || c == '\f' || c == '\r';
-}
-
-char ToLowerAscii(char c) {
-    return c >= 'A' && c <= 'Z' ? static_cast<char>(c - 'A' + 'a') : c;
-}
-
-bool EqualsNoCase(std::string_view a, std::string_view b) {
-    return a.size() == b.size() && std::equal(a.begin(), a.end(), b.begin(), [](char x, char y) {
-               return ToLowerAscii(x) == ToLowerAscii(y);
-           });
-}
-
-std::string_view TrimSpace(std::string_view s) {
-    while (!s.empty() && IsSpace(s.front())) {
-        s.remove_prefix(1);
-    }
-    while (!s.empty() && IsSpace(s.back())) {
-        s.remove_suffix(1);
-    }
-    return s;
-}
-
-// atoi's reading of a number (leading blanks, a sign, digits up to the first other character),
-// but saturating where atoi's overflow would be undefined.
-int ReadDecimal(std::string_view s) {
-    std::size_t i = 0;
-    while (i < s.size() && IsSpace(s[i])) {
-        ++i;
-    }
-    bool negative = false;
-    if (i < s.size() && (s[i] == '+' || s[i] == '-')) {
-        negative = s[i] == '-';
-        ++i;
-    }
-    long long value = 0;
-    for (; i < s.size() && s[i] >= '0' && s[i] <= '9'; ++i) {
-        value = std::min<long long>(value * 10 + (s[i] - '0'), 1LL + INT_MAX);
-    }
-    value = negative ? -value : value;
-    return static_cast<int>(std::clamp<long long>(value, INT_MIN, INT_MAX));
-}
-
-int HexDigit(char c) {
-    if (c >= '0' && c <= '9') {
-        return c - '0';
-    }
-    c = ToLowerAscii(c);
-    return c >= 'a' && c <= 'f' ? c - 'a' + 10 : -1;
-}
-
 // strtoul's reading of a hexadecimal id for a 32-bit unsigned long: leading blanks, a sign, an
 // optional 0x, digits up to the first other character, saturating at 0xFFFFFFFF.
 std::uint32_t ReadHexId(std::string_view s) {
     std::size_t i = 0;
-    while (i < s.size() && IsSpace(s[i])) {
+    while (i < s.size() && IsAsciiSpace(s[i])) {
         ++i;
     }
     bool negative = false;
@@ -87,13 +36,13 @@ std::uint32_t ReadHexId(std::string_view s) {
         ++i;
     }
     if (i + 2 < s.size() && s[i] == '0' && ToLowerAscii(s[i + 1]) == 'x' &&
-        HexDigit(s[i + 2]) >= 0) {
+        HexDigitValue(s[i + 2]) >= 0) {
         i += 2;
     }
     std::uint64_t value = 0;
     bool overflow = false;
-    for (; i < s.size() && HexDigit(s[i]) >= 0; ++i) {
-        value = value * 16 + static_cast<std::uint64_t>(HexDigit(s[i]));
+    for (; i < s.size() && HexDigitValue(s[i]) >= 0; ++i) {
+        value = value * 16 + static_cast<std::uint64_t>(HexDigitValue(s[i]));
         if (value > UINT32_MAX) {
             overflow = true;
             value = UINT32_MAX;
@@ -115,17 +64,17 @@ void ParseHeaderLine(std::string_view line, LanguageTables& tables) {
         return std::nullopt;
     };
     if (auto v = value("CODEPAGE=")) {
-        tables.codePage = ReadDecimal(*v);
+        tables.codePage = ReadAtoi(*v);
     } else if (auto v = value("LANGUAGE=")) {
-        tables.language = ReadDecimal(*v);
+        tables.language = ReadAtoi(*v);
     } else if (auto v = value("SUBLANG=")) {
-        tables.subLang = ReadDecimal(*v);
+        tables.subLang = ReadAtoi(*v);
     } else if (auto v = value("LANGCODE=")) {
-        tables.langCode = std::string(TrimSpace(*v));
+        tables.langCode = std::string(TrimAsciiSpace(*v));
     } else if (value("REVISION=")) {
         // The translators' version-control stamp; nothing reads it.
     } else if (auto v = value("CHARSET=")) {
-        tables.charset = ReadDecimal(*v);
+        tables.charset = ReadAtoi(*v);
     }
 }
 
@@ -275,7 +224,7 @@ std::optional<int> FindFileCodePage(const std::vector<std::string>& rawLines) {
         // Judged as the parser will judge it: a '#' anywhere makes it no header line.
         const std::string line = UnescapeLanguageText(raw);
         if (line.find('#') == std::string::npos) {
-            codePage = ReadDecimal(std::string_view(line).substr(9));
+            codePage = ReadAtoi(std::string_view(line).substr(9));
         }
     }
     return codePage;
@@ -352,12 +301,12 @@ std::string LanguageNameFromLocale(std::string_view localeName) {
         country = localeName.substr(languageEnd + 1);
         country = country.substr(0, country.find_first_of(".@"));
     }
-    if (EqualsNoCase(language, "zh")) {
-        return EqualsNoCase(country, "CN") || EqualsNoCase(country, "SG") ? "Chinese(Simplified)"
+    if (EqualsIgnoringCase(language, "zh")) {
+        return EqualsIgnoringCase(country, "CN") || EqualsIgnoringCase(country, "SG") ? "Chinese(Simplified)"
                                                                           : "Chinese(Traditional)";
     }
     for (const auto& entry : kLocaleLanguages) {
-        if (EqualsNoCase(language, entry.code)) {
+        if (EqualsIgnoringCase(language, entry.code)) {
             return entry.name;
         }
     }
@@ -458,7 +407,7 @@ bool ImLanguage::SelectLanguage(const std::string& name) {
 
     m_strLanguage = "english";
     for (const std::string& known : m_languages) {
-        if (EqualsNoCase(known, name)) {
+        if (EqualsIgnoringCase(known, name)) {
             m_strLanguage = name;
             break;
         }
@@ -469,7 +418,7 @@ bool ImLanguage::SelectLanguage(const std::string& name) {
     m_tableSets.push_back(std::move(next));
     m_tables.store(m_tableSets.back().get(), std::memory_order_release);
     if (!loaded) {
-        if (!EqualsNoCase(name, "English")) {
+        if (!EqualsIgnoringCase(name, "English")) {
             SelectLanguage("English");
             if (m_languageKeyWriter) {
                 m_languageKeyWriter(GetLanguageName());
