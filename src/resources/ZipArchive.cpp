@@ -1,10 +1,12 @@
 #include "resources/ZipArchive.h"
 
 #include "resources/Package.h"
+#include "resources/TextScan.h"
 
 #include <zip.h>
 
 #include <algorithm>
+#include <ctime>
 
 namespace ac {
 namespace {
@@ -17,17 +19,21 @@ constexpr zip_uint64_t kMaxEntries = kNoEntry;
 // forged header must not make us allocate and clear tens of megabytes for a few bytes.
 constexpr std::size_t kReadChunk = 64 * 1024;
 
-char LowerAscii(char c) {
-    return (c >= 'A' && c <= 'Z') ? static_cast<char>(c - 'A' + 'a') : c;
-}
-
 }  // namespace
+
+void PrepareZipLibrary() {
+    // libzip converts entry dates with the C library's local-time calls, whose first use sets
+    // up the time zone lazily. Doing that once here, before two threads can both be first,
+    // keeps the setup off the race.
+    static std::once_flag once;
+    std::call_once(once, [] { ::tzset(); });
+}
 
 std::string ZipArchive::LookupKey(std::string_view name) {
     std::string key;
     key.reserve(name.size());
     for (char c : name) {
-        key.push_back(c == '/' ? '\\' : LowerAscii(c));
+        key.push_back(c == '/' ? '\\' : ToLowerAscii(c));
     }
     while (!key.empty() && key.back() == '\\') {
         key.pop_back();
@@ -36,6 +42,7 @@ std::string ZipArchive::LookupKey(std::string_view name) {
 }
 
 std::shared_ptr<ZipArchive> ZipArchive::Open(const std::string& filePath) {
+    PrepareZipLibrary();
     int error = 0;
     zip_t* handle = zip_open(filePath.c_str(), ZIP_RDONLY, &error);
     if (handle == nullptr) {
@@ -50,6 +57,7 @@ std::shared_ptr<ZipArchive> ZipArchive::Open(const std::string& filePath) {
 }
 
 std::shared_ptr<ZipArchive> ZipArchive::OpenFromMemory(std::string bytes) {
+    PrepareZipLibrary();
     std::shared_ptr<ZipArchive> archive(new ZipArchive);
     archive->m_bytes = std::move(bytes);
     zip_error_t error;
