@@ -550,7 +550,8 @@ bool ImLanguage::TranslateMenu(ITranslatableMenu& menu, int menuId, bool top, in
         if (!text.empty()) {
             menu.SetItemText(position, text);
         } else if (top) {
-            m_barMissText += "#" + menu.GetItemText(position);
+            m_barMissText += '#';
+            m_barMissText += menu.GetItemText(position);
         } else {
             NoteLanguageMiss(LanguageTextKind::Menu, popupKey, menu.GetItemText(position));
         }
