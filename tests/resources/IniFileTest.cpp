@@ -174,6 +174,19 @@ TEST_F(IniThroughPackage, BufferRules) {
     EXPECT_EQ(ac::ReadIniInt("vcache", "MaxFileCache", 0, path), 8096);  // no final CR LF
 }
 
+TEST_F(IniThroughPackage, AHugeTextWithAHugeLineServesItsValues) {
+    std::string text = "[Main]\r\nLong=" + std::string(100000, 'x') + "\r\n";
+    while (text.size() < 10u * 1024 * 1024) {
+        text += "Filler=0123456789012345678901234567890123456789\r\n";
+    }
+    WritePackage({{"skin/Big/skin.ini", text + "Last=42\r\n"}});
+    char buffer[260];
+    EXPECT_EQ(ac::ReadIniInt("Main", "Last", 0, Skin("Big")), 42);
+    EXPECT_EQ(ac::ReadIniString("Main", "Long", "dflt", buffer, sizeof buffer, Skin("Big")),
+              100000u);
+    EXPECT_STREQ(buffer, "dflt");
+}
+
 TEST_F(IniThroughPackage, OneFileCache) {
     ac::ReadIniInt("Main", "LeftMargin", 0, Skin());
     std::size_t loads = ac::IniLoadCount();

@@ -183,6 +183,15 @@ TEST_F(LanguagePackage, LoadsTextsAndFallsBack) {
     EXPECT_EQ(m_keyWrites, (std::vector<std::string>{"english", "English"}));
 }
 
+TEST_F(LanguagePackage, LinesOfAHundredThousandCharactersDoNoHarm) {
+    WritePackage({{"lang/German.lang", "CODEPAGE=1252\r\n#0001# \"" + std::string(100000, '\xE4') +
+                                           "\"\r\n" + std::string(100000, '#') +
+                                           "\r\n#0002# \"Nein\"\r\n"}});
+    m_language.Init(m_base, "German");
+    EXPECT_EQ(m_language.GetString(1).size(), 200000u);  // each CP1252 byte is two in UTF-8
+    EXPECT_EQ(m_language.GetString(2), "Nein");
+}
+
 TEST_F(LanguagePackage, LocaleFollowsStringNinetyNineButNumbersStayC) {
     WritePackage({{"lang/U.lang", "#0063# \"C.UTF-8\"\n"}});
     const std::string saved = std::setlocale(LC_ALL, nullptr);
