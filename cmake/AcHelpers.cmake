@@ -31,6 +31,10 @@ function(ac_add_library name)
   cmake_parse_arguments(ARG "" "" "SOURCES;LIBS" ${ARGN})
   add_library(${name} STATIC ${ARG_SOURCES})
   target_link_libraries(${name} PUBLIC ac_options ${ARG_LIBS})
+  # Window-free libraries are collected for the fuzz targets and benchmarks.
+  if(name MATCHES "_core$")
+    set_property(GLOBAL APPEND PROPERTY AC_CORE_LIBRARIES ${name})
+  endif()
 endfunction()
 
 # ac_add_test(NAME SOURCES... [LIBS ...] [ENV ...] [DISPLAY]): one GoogleTest executable of a
