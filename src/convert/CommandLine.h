@@ -5,6 +5,9 @@
 //    -relk -y  -i "/music/song.wav" -title "My Song"     -acodec "mp3"  -ab "192"  ...
 //
 // Thread contract: any thread; the set passed in belongs to the caller for the call.
+// ParseDuration (profile/Duration.h) comes with this header.
+
+#include "profile/Duration.h"
 
 #include <cstdint>
 #include <string>
@@ -16,10 +19,6 @@ class ParameterSet;
 
 // Volume slider position (50 = unchanged, 0 = half, 100 = double) as ctt's -vol gain (256 = 1.0).
 std::int32_t VolumeToGain(std::int32_t volume);
-
-// "H:M:S[.ffffff]" or plain seconds, optionally negative, in microseconds. Text without leading
-// digits ("Full") is 0.
-std::int64_t ParseDuration(std::string_view text);
 
 // The conversion list's text for source and output paths. Does not delete the old output: the
 // driver does that itself before the launch. May set `title` of a "psp" profile (for the next
