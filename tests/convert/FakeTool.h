@@ -6,6 +6,7 @@
 #include <fstream>
 #include <string>
 #include <sys/stat.h>
+#include <unistd.h>
 
 namespace ac::test {
 
@@ -23,11 +24,29 @@ inline char ProcessState(int pid) {
     return close == std::string::npos || close + 2 >= text.size() ? '?' : text[close + 2];
 }
 
+// Signals arrive a moment after they are sent; the bound only keeps a broken run finite.
+inline bool WaitForProcessState(int pid, char state) {
+    for (int i = 0; i < 2000; ++i) {
+        if (ProcessState(pid) == state) return true;
+        ::usleep(5000);
+    }
+    return false;
+}
+
 inline int CountOpenFds() {
     int count = 0;
     for ([[maybe_unused]] auto& entry : std::filesystem::directory_iterator("/proc/self/fd"))
         ++count;
     return count;
+}
+
+}  // namespace ac::test
+
+namespace ac::test {
+
+inline std::string ReadFile(const std::string& path) {
+    std::ifstream in(path);
+    return std::string((std::istreambuf_iterator<char>(in)), {});
 }
 
 }  // namespace ac::test
