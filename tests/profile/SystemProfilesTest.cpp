@@ -68,6 +68,24 @@ int RunTool(const std::string& program, const std::vector<std::string>& words, c
     return WIFEXITED(status) ? WEXITSTATUS(status) : -1;
 }
 
+// Whether the first bytes are those of the container the extension promises: ctt must not write
+// a file of another format under the right name.
+bool StartsLikeItsFormat(const std::string& extension, const std::string& head) {
+    auto at = [&](std::size_t offset, std::string_view magic) { return head.compare(offset, magic.size(), magic) == 0; };
+    const auto byte = [&](std::size_t i) { return i < head.size() ? static_cast<unsigned char>(head[i]) : 0u; };
+    const bool mpegSync = byte(0) == 0xFF && (byte(1) & 0xE0) == 0xE0;
+    if (extension == "mp3" || extension == "mp2") return at(0, "ID3") || mpegSync;
+    if (extension == "aac") return byte(0) == 0xFF && (byte(1) & 0xF6) == 0xF0;  // ADTS, layer 0
+    if (extension == "ac3") return byte(0) == 0x0B && byte(1) == 0x77;
+    if (extension == "m4a") return at(4, "ftyp");
+    if (extension == "wma") return at(0, "\x30\x26\xB2\x75\x8E\x66\xCF\x11");
+    if (extension == "flac") return at(0, "fLaC");
+    if (extension == "ogg") return at(0, "OggS");
+    if (extension == "wav") return at(0, "RIFF") && at(8, "WAVE");
+    if (extension == "au") return at(0, ".snd");
+    return false;
+}
+
 class SystemProfile : public ac::test::ProfileFiles, public ::testing::WithParamInterface<std::string> {
 protected:
     void SetUp() override {
@@ -121,6 +139,7 @@ TEST_P(SystemProfile, ConvertsAToneThroughTheTool) {
         << text << "\n" << ac::test::ReadFile(m_tmp / "log");
     ASSERT_TRUE(fs::exists(output)) << output;
     EXPECT_GT(fs::file_size(output), 1000u);
+    EXPECT_TRUE(StartsLikeItsFormat(m_profile->GetExtName(), ac::test::ReadFile(output).substr(0, 16)));
 }
 
 INSTANTIATE_TEST_SUITE_P(Shipped, SystemProfile, ::testing::ValuesIn(ShippedProfiles()),
