@@ -113,7 +113,8 @@ INSTANTIATE_TEST_SUITE_P(
         BadCommandCase{"CodecNotInForcedFormat", {"-acodec", "vorbis", "-f", "mp3"}, "o.mp3", "does not fit"},
         BadCommandCase{"RateTheCodecLacks", {"-acodec", "mp3", "-ar", "96000"}, "o.mp3", "96000"},
         BadCommandCase{"UnknownExtension", {}, "o.xyz", "format"},
-        BadCommandCase{"NoFolder", {}, "missing/o.mp3", "does not exist"}),
+        BadCommandCase{"NoFolder", {}, "missing/o.mp3", "does not exist"},
+        BadCommandCase{"StartPastTheEnd", {"-ss", "5"}, "o.wav", "beyond the end"}),
     [](const auto& info) { return std::string(info.param.name); });
 
 TEST_F(CttErrors, ReadOnlyFolder) {

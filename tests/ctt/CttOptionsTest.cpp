@@ -70,7 +70,7 @@ INSTANTIATE_TEST_SUITE_P(
     Table, CttOptionValues,
     ::testing::Values(ValueCase{"-ar banana", "-ar"}, ValueCase{"-ar 44100", nullptr},
                       ValueCase{"-ar \"Auto\"", nullptr}, ValueCase{"-ar 12", "-ar"},
-                      ValueCase{"-ac \"2 (Stereo)\"", nullptr}, ValueCase{"-ac 0", "-ac"},
+                      ValueCase{"-ac \"2 (Stereo)\"", nullptr}, ValueCase{"-ac 9", "-ac"},
                       ValueCase{"-ac stereo", "-ac"}, ValueCase{"-ab 128k", nullptr},
                       ValueCase{"-ab fast", "-ab"}, ValueCase{"-vol 512", nullptr},
                       ValueCase{"-vol -3", "-vol"}, ValueCase{"-vol 1.5", "-vol"},
@@ -82,6 +82,19 @@ INSTANTIATE_TEST_SUITE_P(
                       ValueCase{"-frobnicate 1", "unknown option"}, ValueCase{"stray", "unexpected"},
                       ValueCase{"-an", "-an"}, ValueCase{"-threads many", "-threads"},
                       ValueCase{"-title \"\"", nullptr}));
+
+TEST(CttOptions, RipDriverLineWithEmptyCodecAndZeroRate) {
+    // What the rip driver sends for a row whose profile lacks a codec and a sample rate.
+    const ParseResult r = Parse("-relk -y -i \"/dev/sr0/Track03.cda\" -acodec  -title \"-Intro-\" "
+                                "-album \"\"  -author \"\"  -genre \"\"  -year \"\"  -id3v1 -id3v2  "
+                                "-ar 0 -ac 0 -ab 192  -vol 256 \"/music/a/b/03.mp3\"");
+    ASSERT_TRUE(r.options) << r.error;
+    EXPECT_EQ(r.options->codec, "");
+    EXPECT_EQ(r.options->tags.at("title"), "-Intro-");
+    EXPECT_EQ(r.options->sampleRate, 0);
+    EXPECT_EQ(r.options->channels, 0);
+    EXPECT_EQ(r.options->bitRate, 192000);
+}
 
 TEST(CttOptions, MissingPiecesAreErrors) {
     EXPECT_FALSE(ParseArguments({}).options);

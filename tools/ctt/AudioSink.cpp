@@ -151,7 +151,10 @@ std::string TempPathFor(const std::string& output) {
     namespace fs = std::filesystem;
     fs::path out(output);
     fs::path dir = out.parent_path();
-    std::string name = "." + out.filename().string() + ".ctt" + std::to_string(::getpid()) + ".part";
+    // Beside the output, so the final rename stays on one file system; short enough for
+    // NAME_MAX even when the output's own name is near it.
+    std::string name = "." + out.filename().string().substr(0, 200) + ".ctt" +
+                       std::to_string(::getpid()) + ".part";
     return (dir / name).string();
 }
 

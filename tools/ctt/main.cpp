@@ -207,13 +207,18 @@ int Convert(const CttOptions& options) {
         ReportError(source->Error());
         result = 1;
     }
+    if (result == 0 && done == 0 && windowStart > 0) {
+        ReportError("the start time lies beyond the end of the input");
+        result = 1;
+    }
     if (result == 0 && !sink.Commit(error)) {
         ReportError(error);
         result = 1;
     }
     if (result == 0) {
         ReportTime(static_cast<double>(done) / rate);
-        ReportStatus("Done: " + options.output);
+        // The rip driver fails a track whose stdout holds "Error" anywhere: keep paths out.
+        ReportStatus("Done.");
     } else if (s_stopRequested) {
         ReportError("stopped");
     }
