@@ -203,12 +203,12 @@ int Convert(const CttOptions& options) {
         }
     }
     av_frame_free(&frame);
-    if (result == 0 && sourceEnded && options.durationUs == 0 && !source->CheckComplete(spanReached)) {
-        ReportError(source->Error());
-        result = 1;
-    }
     if (result == 0 && done == 0 && windowStart > 0) {
         ReportError("the start time lies beyond the end of the input");
+        result = 1;
+    }
+    if (result == 0 && sourceEnded && options.durationUs == 0 && !source->CheckComplete(spanReached)) {
+        ReportError(source->Error());
         result = 1;
     }
     if (result == 0 && !sink.Commit(error)) {
