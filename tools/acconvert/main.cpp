@@ -14,6 +14,7 @@
 #include "platform/Paths.h"
 #include "profile/ParameterSet.h"
 #include "resources/Package.h"
+#include "resources/PackageWriter.h"
 #include "rip/CueSheet.h"
 #include "shell/AppConfig.h"
 
@@ -23,6 +24,7 @@
 #include <cstdlib>
 #include <cstring>
 #include <filesystem>
+#include <fstream>
 #include <string>
 #include <vector>
 #include <unistd.h>
@@ -89,58 +91,98 @@ ParameterSet& SetOf(MediaItem& item) {
     return static_cast<ProfileParameters&>(*item.parameters).Set();
 }
 
-// A file on disk, else a system profile, else a user profile, by file name or shown name.
-std::unique_ptr<Profile> FindProfile(const std::string& wanted, const std::string& base) {
-    if (fs::is_regular_file(wanted)) {
-        auto profile = std::make_unique<Profile>(wanted);
-        return profile->IsLoaded() ? std::move(profile) : nullptr;
+// Held through its base: the profile keeps its value lists in a type of its own.
+std::unique_ptr<ParameterSet> LoadProfile(const std::string& path) {
+    auto* profile = new Profile(path);
+    std::unique_ptr<ParameterSet> owner(profile);
+    return profile->IsLoaded() ? std::move(owner) : nullptr;
+}
+
+// Profiles are read through the package layer only, so a .pf file given on the command line
+// travels in a one-entry package of its own in a scratch folder, removed when the run ends.
+class LoosePackage {
+public:
+    ~LoosePackage() {
+        std::error_code ignored;
+        if (!m_folder.empty()) fs::remove_all(m_folder, ignored);
     }
+    std::string Wrap(const std::string& file) {
+        std::string pattern = (fs::temp_directory_path() / "acconvert-XXXXXX").string();
+        if (!::mkdtemp(pattern.data())) return {};
+        m_folder = pattern;
+        std::ifstream in(file, std::ios::binary);
+        std::string text((std::istreambuf_iterator<char>(in)), {});
+        // The package's ini reader splits at CR LF, the line end profiles have always had.
+        if (text.find("\r\n") == std::string::npos) {
+            std::string crlf;
+            for (char c : text) c == '\n' ? crlf += "\r\n" : crlf += c;
+            text.swap(crlf);
+        }
+        PackageWriter writer;
+        std::string package = m_folder + "/cli.pkg";
+        if (!writer.Create() || !writer.Put("cli.pf", text) || !writer.Commit(package)) return {};
+        return package + "\\cli.pf";
+    }
+
+private:
+    std::string m_folder;
+};
+
+// A file on disk, else a system profile, else a user profile, by file name or shown name.
+std::unique_ptr<ParameterSet> FindProfile(const std::string& wanted, const std::string& base,
+                                          LoosePackage& loose) {
+    if (fs::is_regular_file(wanted)) return LoadProfile(loose.Wrap(wanted));
     for (const char* folder : {"\\profile\\", "\\profile\\user\\"}) {
         std::string direct = base + folder + wanted + ".pf";
-        if (ResourceExists(direct)) {
-            auto profile = std::make_unique<Profile>(direct);
-            if (profile->IsLoaded()) return profile;
-        }
+        if (ResourceExists(direct))
+            if (auto profile = LoadProfile(direct)) return profile;
         ImPackageFinder finder;
         for (bool more = finder.FindFile(base + folder + "*.pf"); more; more = finder.FindNextFile()) {
-            auto profile = std::make_unique<Profile>(finder.GetFilePath());
-            if (profile->IsLoaded() && profile->GetName() == wanted) return profile;
+            auto profile = LoadProfile(finder.GetFilePath());
+            if (profile && profile->GetName() == wanted) return profile;
         }
     }
     return nullptr;
 }
 
-std::unique_ptr<MediaItem> MakeRow(const std::string& sourcePath, const Profile& profile) {
+// name: what the list shows in its Name column, which also names the output.
+std::unique_ptr<MediaItem> MakeRow(const std::string& sourcePath, const std::string& name,
+                                   const ParameterSet& profile) {
     auto item = std::make_unique<MediaItem>();
     item->sourcePath = sourcePath;
     bool probed = ProbeFile(sourcePath, item->info) == 1;
     auto set = profile.Clone();
     if (probed) ApplyTags(*set, &item->info);
+    set->SetValue("outfilename", name);
     item->parameters = std::make_unique<ProfileParameters>(std::move(set));
     item->SetStatus(probed ? JobStatus::Idle : JobStatus::UnknownFile);
     return item;
 }
 
 // Cue sheets stand for their tracks, as in the list: one row per "SHEET|N".
-void AddSource(console::ConsoleRun& run, const std::string& path, const Profile& profile) {
+void AddSource(console::ConsoleRun& run, const std::string& path, const ParameterSet& profile) {
     std::string extension = fs::path(path).extension().string();
     for (auto& c : extension) c = static_cast<char>(std::tolower(static_cast<unsigned char>(c)));
     if (extension != ".cue") {
-        run.AddRow(MakeRow(path, profile));
+        run.AddRow(MakeRow(path, fs::path(path).stem().string(), profile));
         return;
     }
     std::string diagnostics;
     CueOutput quiet{&diagnostics, &diagnostics};
     ParseCueSheet(path, quiet);
-    std::uint32_t tracks = g_CueSheet ? g_CueSheet->trackCount : 0;
+    std::vector<std::string> titles;
+    if (g_CueSheet)
+        for (std::uint32_t i = 0; i < g_CueSheet->trackCount; ++i)
+            titles.emplace_back(g_CueSheet->tracks[i].title);
     FreeCueSheet();
+    auto tracks = static_cast<std::uint32_t>(titles.size());
     if (tracks == 0) {
         std::fprintf(stderr, "acconvert: %s: no tracks in the cue sheet\n", path.c_str());
-        run.AddRow(MakeRow(path, profile));  // shows as an unknown file
+        run.AddRow(MakeRow(path, fs::path(path).stem().string(), profile));  // an unknown file
         return;
     }
     for (std::uint32_t track = 1; track <= tracks; ++track)
-        run.AddRow(MakeRow(path + "|" + std::to_string(track), profile));
+        run.AddRow(MakeRow(path + "|" + std::to_string(track), titles[track - 1], profile));
 }
 
 std::string FindTool() {
@@ -161,7 +203,8 @@ int main(int argc, char** argv) {
     }
     AppConfig& config = GetAppConfig();
     std::string base = config.GetBaseDirectory();
-    std::unique_ptr<Profile> profile = FindProfile(options.profile, base);
+    LoosePackage loose;
+    std::unique_ptr<ParameterSet> profile = FindProfile(options.profile, base, loose);
     if (!profile) {
         std::fprintf(stderr, "acconvert: no profile named %s\n", options.profile.c_str());
         return 2;
