@@ -133,7 +133,7 @@ void ImSkinDialog::ShowCaption(bool show) {
     RecalcLayout();
 }
 
-ImMenuBar* ImSkinDialog::GetMenuBar(bool create) {
+ImMenuBar* ImSkinDialog::GetSkinMenuBar(bool create) {
     if (m_menuBar == nullptr && create) {
         m_menuBar = new ImMenuBar(m_hWnd, this);
     }

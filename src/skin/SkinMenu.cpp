@@ -52,6 +52,11 @@ ImMenuPopup::ImMenuPopup(wxWindow* owner, ImMenuBar* bar, const wxFont& font)
     Bind(wxEVT_LEAVE_WINDOW, &ImMenuPopup::OnMouse, this);
 }
 
+ImMenuPopup::~ImMenuPopup() {
+    // When the frame goes, wx frees every popup itself, the child included.
+    (void)m_pChild.release();
+}
+
 void ImMenuPopup::Measure() {
     m_rects.clear();
     m_hotKeys.clear();
@@ -336,7 +341,14 @@ ImMenuBar::ImMenuBar(wxWindow* parent, ImSkinDialog* owner)
     Bind(wxEVT_MOUSE_CAPTURE_LOST, [this](wxMouseCaptureLostEvent&) { m_bDragging = false; });
 }
 
-ImMenuBar::~ImMenuBar() = default;
+ImMenuBar::~ImMenuBar() {
+    (void)m_popup.release();
+}
+
+void ImMenuBar::DestroyPopups() {
+    m_bOpen = false;
+    m_popup.reset();
+}
 
 void ImMenuBar::SetMenu(std::unique_ptr<ImMenu> menu) {
     CloseMenus();
@@ -402,7 +414,10 @@ void ImMenuBar::Measure() {
         const SkinRect& last = m_itemRects.back();
         SetSize(last.Right() + m_itemLeft + 2, last.Bottom() + m_marginTop);
     }
-    m_popup.reset(new ImMenuPopup(this, this, m_popupFont));
+    if (!m_popup) {
+        m_popup.reset(new ImMenuPopup(this, this, m_popupFont));
+    }
+    m_popup->SetPopupFont(m_popupFont);
     Refresh();
 }
 
@@ -443,7 +458,7 @@ int ImMenuBar::EntryAt(const wxPoint& point) const {
 }
 
 void ImMenuBar::OpenEntry(int index) {
-    if (!m_menu || index < 0 || index >= m_itemCount) {
+    if (!m_popup || !m_menu || index < 0 || index >= m_itemCount) {
         CloseMenus();
         return;
     }
