@@ -467,8 +467,10 @@ void CAudioEncDlg::RunScriptCommand(const std::string& line) {
         in >> name;
         for (const auto& [id, dir] : m_skinCommands) {
             if (SkinNameOf(dir) == name) {
+                // The command rebuilds the menu and this map: leave the loop first.
                 wxCommandEvent command(wxEVT_MENU, id);
                 OnCommand(command);
+                break;
             }
         }
     } else if (verb == "language") {

@@ -27,6 +27,23 @@ char Mnemonic(const wxString& text) {
     return SplitMnemonic(text.utf8_string()).second;
 }
 
+// Draws text with its '&' shown as an underline under the character that follows it.
+void DrawMnemonicLabel(wxDC& dc, const wxString& text, const wxRect& rect, int alignment) {
+    wxString plain;
+    int underline = -1;
+    for (std::size_t i = 0; i < text.length(); ++i) {
+        if (text[i] == '&' && i + 1 < text.length()) {
+            if (text[i + 1] != '&') {
+                underline = static_cast<int>(plain.length());
+            }
+            plain += text[++i];
+            continue;
+        }
+        plain += text[i];
+    }
+    dc.DrawLabel(plain, wxNullBitmap, rect, alignment, underline);
+}
+
 }  // namespace
 
 void PopupDestroyer::operator()(ImMenuPopup* popup) const {
@@ -315,7 +332,8 @@ void ImMenuPopup::OnPaint(wxPaintEvent& /*event*/) {
         }
         dc.SetTextForeground(colour);
         const wxString label = text.BeforeFirst('\t');
-        dc.DrawLabel(label, wxRect(23, textY, m_width - 23, textHeight), wxALIGN_LEFT | wxALIGN_TOP);
+        DrawMnemonicLabel(dc, label, wxRect(23, textY, m_width - 23, textHeight),
+                          wxALIGN_LEFT | wxALIGN_TOP);
         if (text.Contains("\t")) {
             const wxString accel = text.AfterFirst('\t');
             dc.DrawText(accel, m_width - 20 - dc.GetTextExtent(accel).x, textY);
@@ -507,7 +525,7 @@ void ImMenuBar::OnPaint(wxPaintEvent& /*event*/) {
             colour = i == m_hot ? m_colours.selectedText : m_colours.normalText;
         }
         dc.SetTextForeground(colour);
-        dc.DrawLabel(EntryText(i), wxRect(r.x, r.y, r.w, r.h), wxALIGN_CENTER);
+        DrawMnemonicLabel(dc, EntryText(i), wxRect(r.x, r.y, r.w, r.h), wxALIGN_CENTER);
     }
 }
 
