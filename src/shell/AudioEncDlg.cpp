@@ -487,6 +487,19 @@ void CAudioEncDlg::RunScriptCommand(const std::string& line) {
         int x = 0, y = 0, w = 0, h = 0;
         in >> x >> y >> w >> h;
         SetSize(x, y, w, h);
+    } else if (verb == "menu") {
+        int index = 0;
+        std::string key;
+        in >> index >> key;
+        if (ImMenuBar* bar = GetSkinMenuBar(false)) {
+            bar->OpenByIndex(index);
+            if (!key.empty() && bar->Popup() != nullptr) {
+                // "down" and "right" walk the open popup as the keyboard does.
+                for (char c : key) {
+                    bar->Popup()->OnKey(c == 'd' ? WXK_DOWN : c == 'r' ? WXK_RIGHT : WXK_UP);
+                }
+            }
+        }
     } else if (verb == "close") {
         Close();
     }

@@ -493,6 +493,16 @@ void ImMenuBar::OpenEntry(int index) {
     m_popup->ShowAt(x, y);
 }
 
+void ImMenuBar::OpenByIndex(int index) {
+    if (index < 0 || index >= m_itemCount) {
+        return;
+    }
+    m_bOpen = true;
+    m_hot = index;
+    Refresh(false);
+    OpenEntry(index);
+}
+
 void ImMenuBar::OnPaint(wxPaintEvent& /*event*/) {
     wxAutoBufferedPaintDC dc(this);
     const wxSize size = GetClientSize();

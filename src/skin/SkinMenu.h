@@ -106,6 +106,8 @@ public:
     void CommandChosen();
     void AnnouncePopup(wxMenu* menu);
     ImMenuPopup* Popup() const { return m_popup.get(); }
+    // Enters open mode on entry index, as a click on it does.
+    void OpenByIndex(int index);
 
 private:
     void OnPaint(wxPaintEvent& event);
