@@ -144,7 +144,12 @@ void EncodingDriver::StartRow(int row, MediaItem& item, bool& proceed, std::stri
         return;
 
     CEncodeProcess* child = item.process.load();
-    if (!child) {
+    if (child) {
+        // A row stopped and encoded again may still have its last exit on the way; let it
+        // settle first, or it would land on the new run.
+        child->WaitForExit();
+        if (item.Status() != JobStatus::Waiting) return;
+    } else {
         item.AdoptProcess(std::make_unique<CEncodeProcess>(
             [this](CEncodeProcess* process) { OnProcessExit(process); }));
         child = item.process.load();
