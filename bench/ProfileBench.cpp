@@ -47,6 +47,7 @@ namespace {
 struct Fixture {
     std::string base;
     std::string path;
+    std::string userPath;
     Fixture() {
         char pattern[] = "/tmp/ac-bench-XXXXXX";
         base = ::mkdtemp(pattern);
@@ -69,6 +70,10 @@ struct Fixture {
         data.Put("profile/mp3.pf", text.str());
         data.Commit(base + "/data.pkg");
         path = base + "\\profile\\mp3.pf";
+        // The same profile saved by the user: user.pkg texts are read anew at every lookup.
+        userPath = base + "\\profile\\user\\Mine.pf";
+        ac::Profile stock(path);
+        ac::SaveProfile(stock, stock, "Mine", userPath);
     }
     ~Fixture() {
         std::error_code ignored;
@@ -103,6 +108,13 @@ void BM_Clone(benchmark::State& state) {
     for (auto _ : state) benchmark::DoNotOptimize(profile.Clone());
 }
 BENCHMARK(BM_Clone)->Unit(benchmark::kMicrosecond);
+
+void BM_CloneUserProfile(benchmark::State& state) {
+    ac::Profile profile(Shared().userPath);
+    if (!profile.IsLoaded()) state.SkipWithError("user profile not saved");
+    for (auto _ : state) benchmark::DoNotOptimize(profile.Clone());
+}
+BENCHMARK(BM_CloneUserProfile)->Unit(benchmark::kMicrosecond);
 
 void BM_ConversionCommandText(benchmark::State& state) {
     ac::Profile profile(Shared().path);

@@ -6,6 +6,7 @@
 #include "profile/ParameterSet.h"
 
 #include "profile/TextUtil.h"
+#include "resources/IniFile.h"
 #include "resources/Language.h"
 #include "resources/Package.h"
 
@@ -20,6 +21,37 @@ constexpr std::size_t kEntryBufferSize = 512;
 std::string ReadMain(const char* key, std::string_view path) {
     return ReadIniText("Main", key, "", path);
 }
+
+// The Parameter section of one file, read once. ReadIniString would do the same per key, but
+// user.pkg texts are read anew at every call, and a row's clone reads all 142 keys: a user
+// profile then cost milliseconds per row. The lines, the key search and the value cleaning are
+// the ini layer's own, so an entry reads here exactly as through ReadIniString.
+class ParameterSection {
+public:
+    explicit ParameterSection(std::string_view path) {
+        ImPackageFinder finder;
+        if (!finder.ReadLines(path)) return;
+        std::string text;
+        for (const std::string& line : finder.Names()) {
+            text += line;
+            text += '\n';
+        }
+        m_ini.LoadFromText(text);
+        m_loaded = true;
+    }
+
+    // Empty when absent, or when the entry would not fit the ini reader's buffer.
+    std::string Entry(const std::string& key) const {
+        std::string value;
+        if (!m_loaded || !m_ini.GetValue("Parameter", key.c_str(), value)) return {};
+        value = CleanIniValue(value);
+        return value.size() < kEntryBufferSize ? value : std::string();
+    }
+
+private:
+    ImIniFile m_ini;
+    bool m_loaded = false;
+};
 
 std::string CleanField(const FieldSplitter& splitter, std::size_t index) {
     return std::string(TrimBlanks(splitter.GetField(index, true)));
@@ -83,9 +115,10 @@ bool Profile::Load(std::string path) {
     m_lists.clear();
     if (GetName().empty()) return false;
 
+    const ParameterSection section(m_path);
     for (const ParameterDef& def : ParameterTable()) {
         const std::string key(def.key);
-        const std::string entry = ReadIniText("Parameter", key.c_str(), "", m_path, kEntryBufferSize);
+        const std::string entry = section.Entry(key);
         if (entry.empty()) continue;
 
         const std::size_t brace = entry.rfind('{');

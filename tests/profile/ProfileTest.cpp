@@ -179,13 +179,4 @@ TEST_F(ProfileMain, SaveWritesWhatTheFileSaidWithTheWorkingValues) {
     EXPECT_EQ(mine.GetValue("title"), "Studio");
 }
 
-TEST(ParameterEntryText, ListAndFlagForms) {
-    ac::ParameterRecord record{"ab", 0, "Auto", "ignored", {}};
-    EXPECT_EQ(ac::FormatParameterEntry(record, "128"), "0, \"Auto\", \"128\"");
-    constexpr std::string_view kItems[] = {"64", "128"};
-    record.flags = ac::PARAM_READONLY;
-    record.values = kItems;
-    EXPECT_EQ(ac::FormatParameterEntry(record, "128"), "READONLY, \"Auto\", \"128\", {\"64\", \"128\"}");
-}
-
 }  // namespace
