@@ -4,6 +4,7 @@
 #include <cstring>
 
 #include "Report.h"
+#include "medialist/MediaProbe.h"
 #include "Sources.h"
 
 extern "C" {
@@ -63,7 +64,7 @@ public:
             m_error = "cannot open input \"" + path + "\": " + AvError(r);
             return false;
         }
-        r = avformat_find_stream_info(m_format, nullptr);
+        r = HeaderIsComplete(m_format) ? 0 : avformat_find_stream_info(m_format, nullptr);
         if (r < 0) {
             m_error = "cannot read the streams of \"" + path + "\": " + AvError(r);
             return false;

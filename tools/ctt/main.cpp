@@ -61,10 +61,9 @@ std::unique_ptr<AudioSource> OpenSource(const CttOptions& options, std::string& 
             auto source = OpenFileSource(span.audioPath, startUs, endUs, error);
             if (source) {
                 // The sheet's titles stand in for tags the command line does not give.
-                auto& tags = const_cast<std::map<std::string, std::string>&>(source->Tags());
-                if (!span.title.empty()) tags["title"] = span.title;
-                if (!span.performer.empty()) tags["author"] = span.performer;
-                if (!span.album.empty()) tags["album"] = span.album;
+                if (!span.title.empty()) source->SetTag("title", span.title);
+                if (!span.performer.empty()) source->SetTag("author", span.performer);
+                if (!span.album.empty()) source->SetTag("album", span.album);
             }
             return source;
         }
