@@ -11,6 +11,7 @@
 #include <cerrno>
 #include <cmath>
 #include <cstring>
+#include <filesystem>
 #include <memory>
 #include <string>
 #include <vector>
@@ -81,13 +82,9 @@ std::unique_ptr<AudioSource> OpenSource(const CttOptions& options, std::string& 
 }
 
 bool OutputFolderUsable(const std::string& output, std::string& error) {
-    std::string dir = output.substr(0, output.find_last_of('/') == std::string::npos
-                                           ? 0
-                                           : output.find_last_of('/'));
-    if (output.find('/') == std::string::npos) {
+    std::string dir = std::filesystem::path(output).parent_path().string();
+    if (dir.empty()) {
         dir = ".";
-    } else if (dir.empty()) {
-        dir = "/";
     }
     struct stat st {};
     if (::stat(dir.c_str(), &st) != 0 || !S_ISDIR(st.st_mode)) {
