@@ -82,10 +82,8 @@ std::unique_ptr<AudioSource> OpenSource(const CttOptions& options, std::string& 
 }
 
 bool OutputFolderUsable(const std::string& output, std::string& error) {
-    std::string dir = std::filesystem::path(output).parent_path().string();
-    if (dir.empty()) {
-        dir = ".";
-    }
+    const std::filesystem::path parent = std::filesystem::path(output).parent_path();
+    const std::string dir = parent.empty() ? std::string(".") : parent.string();
     struct stat st {};
     if (::stat(dir.c_str(), &st) != 0 || !S_ISDIR(st.st_mode)) {
         error = "the output folder \"" + dir + "\" does not exist";
@@ -236,7 +234,8 @@ int main(int argc, char** argv) {
     if (!options.ignored.empty()) {
         std::string names;
         for (const std::string& name : options.ignored) {
-            names += (names.empty() ? "-" : ", -") + name;
+            names += names.empty() ? "-" : ", -";
+            names += name;
         }
         ReportWarning("video options have no effect on an audio output: " + names);
     }
