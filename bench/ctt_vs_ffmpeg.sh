@@ -45,7 +45,7 @@ run() {
 
 median() { sort -n | awk '{v[NR]=$1} END {if (NR % 2) print v[(NR+1)/2]; else print (v[NR/2]+v[NR/2+1])/2}'; }
 
-printf '%-11s %6s %9s %9s %7s %8s %8s %9s %9s\n' format input ctt_s ffmpeg_s ratio ctt_cpu ff_cpu cpu_ratio ctt_KB ffmpeg_KB
+printf '%-11s %6s %9s %9s %7s %8s %8s %9s %9s %9s\n' format input ctt_s ffmpeg_s ratio ctt_cpu ff_cpu cpu_ratio ctt_KB ffmpeg_KB
 for seconds in $lengths; do
   rounds=$repeats
   [ "$seconds" = 600 ] && rounds=$(( repeats < 3 ? repeats : 3 ))
