@@ -4,6 +4,7 @@
 # medians of wall time and peak memory are compared. Ratios below 1 mean ctt was faster.
 #
 #   bench/ctt_vs_ffmpeg.sh [CTT] [REPEATS]      (CTT defaults to build/bin/ctt)
+#   LENGTHS="1 60" bench/ctt_vs_ffmpeg.sh       (input lengths in seconds; default 1 60 600)
 #
 # Goals: ctt/ffmpeg <= 1.05 for a 60 s MP3 and <= 1.10 for the others, <= 1.00 on 1 s
 # (ctt loads fewer libraries), <= 1.03 on 10 minutes; ctt's peak memory at most ffmpeg's and
@@ -12,10 +13,11 @@ set -euo pipefail
 top=$(cd "$(dirname "$0")/.." && pwd)
 ctt=${1:-$top/build/bin/ctt}
 repeats=${2:-5}
+lengths=${LENGTHS:-1 60 600}
 work=$(mktemp -d "${TMPDIR:-/tmp}/ctt-bench-XXXXXX")
 trap 'rm -rf "$work"' EXIT
 
-for seconds in 1 60 600; do
+for seconds in $lengths; do
   ffmpeg -nostdin -loglevel error -y -filter_complex \
     "sine=frequency=440:duration=$seconds:sample_rate=44100[a];anoisesrc=seed=1:amplitude=0.3:duration=$seconds:sample_rate=44100[b];[a][b]amerge=inputs=2" \
     -c:a pcm_s16le "$work/in$seconds.wav"
@@ -30,20 +32,21 @@ formats=(
   "wma|-acodec wmav2 -ab 128|-c:a wmav2 -b:a 128k|wma"
 )
 
-# run OUTFILE_PREFIX COMMAND...: appends "seconds peak_kb" to OUTFILE_PREFIX.log
+# run LOG COMMAND...: appends "wall_us peak_kb cpu_s" to LOG. CPU time (user + system) is
+# printed beside wall time: on a shared, busy machine it is the steadier of the two.
 run() {
   local log=$1; shift
   local start end
   start=$(date +%s%N)
-  /usr/bin/time -f %M -o "$work/mem" "$@" >/dev/null 2>&1
+  /usr/bin/time -f '%M %U %S' -o "$work/mem" "$@" >/dev/null 2>&1
   end=$(date +%s%N)
-  echo "$(( (end - start) / 1000 )) $(cat "$work/mem")" >> "$log"
+  echo "$(( (end - start) / 1000 )) $(awk '{print $1, $2 + $3}' "$work/mem")" >> "$log"
 }
 
 median() { sort -n | awk '{v[NR]=$1} END {if (NR % 2) print v[(NR+1)/2]; else print (v[NR/2]+v[NR/2+1])/2}'; }
 
-printf '%-11s %6s %10s %10s %7s %10s %10s\n' format input ctt_s ffmpeg_s ratio ctt_KB ffmpeg_KB
-for seconds in 1 60 600; do
+printf '%-11s %6s %9s %9s %7s %8s %8s %9s %9s %9s\n' format input ctt_s ffmpeg_s ratio ctt_cpu ff_cpu cpu_ratio ctt_KB ffmpeg_KB
+for seconds in $lengths; do
   rounds=$repeats
   [ "$seconds" = 600 ] && rounds=$(( repeats < 3 ? repeats : 3 ))
   for entry in "${formats[@]}"; do
@@ -64,7 +67,9 @@ for seconds in 1 60 600; do
     ft=$(awk '{print $1}' "$work/ff.log" | median)
     cm=$(awk '{print $2}' "$work/ctt.log" | median)
     fm=$(awk '{print $2}' "$work/ff.log" | median)
-    awk -v n="$name" -v s="${seconds}s" -v ct="$ct" -v ft="$ft" -v cm="$cm" -v fm="$fm" \
-      'BEGIN {printf "%-11s %6s %10.3f %10.3f %7.3f %10d %10d\n", n, s, ct/1e6, ft/1e6, ct/ft, cm, fm}'
+    cc=$(awk '{print $3}' "$work/ctt.log" | median)
+    fc=$(awk '{print $3}' "$work/ff.log" | median)
+    awk -v n="$name" -v s="${seconds}s" -v ct="$ct" -v ft="$ft" -v cm="$cm" -v fm="$fm" -v cc="$cc" -v fc="$fc" \
+      'BEGIN {printf "%-11s %6s %9.3f %9.3f %7.3f %8.2f %8.2f %9.3f %9d %9d\n", n, s, ct/1e6, ft/1e6, ct/ft, cc, fc, (fc > 0 ? cc/fc : 0), cm, fm}'
   done
 done

@@ -159,6 +159,23 @@ void ReadTags(const AVFormatContext* ic, const AVStream* audio, MediaFileInfo& i
 
 }  // namespace
 
+bool HeaderIsComplete(const AVFormatContext* ic, bool anyCodec) {
+    if (ic->nb_streams == 0 || (ic->ctx_flags & AVFMTCTX_NOHEADER)) {
+        return false;
+    }
+    for (unsigned i = 0; i < ic->nb_streams; ++i) {
+        const AVCodecParameters* par = ic->streams[i]->codecpar;
+        const bool pcm = par->codec_id >= AV_CODEC_ID_PCM_S16LE && par->codec_id < AV_CODEC_ID_ADPCM_IMA_QT;
+        const bool trusted = pcm || (anyCodec && par->codec_id != AV_CODEC_ID_AAC &&
+                                     par->codec_id != AV_CODEC_ID_NONE);
+        if (par->codec_type != AVMEDIA_TYPE_AUDIO || !trusted || par->sample_rate <= 0 ||
+            par->ch_layout.nb_channels <= 0 || ic->streams[i]->duration == AV_NOPTS_VALUE) {
+            return false;
+        }
+    }
+    return true;
+}
+
 int ProbeFile(const std::string& path, MediaFileInfo& info) {
     info.path = path;
     info.hours = info.minutes = info.seconds = info.microseconds = 0;
@@ -187,7 +204,10 @@ int ProbeFile(const std::string& path, MediaFileInfo& info) {
     // the packets fills in the rest.
     ic->probesize = 256 * 1024;
     ic->max_analyze_duration = 500000;
-    avformat_find_stream_info(ic, nullptr);
+    const bool quick = HeaderIsComplete(ic, true);
+    if (!quick) {
+        avformat_find_stream_info(ic, nullptr);
+    }
 
     const AVStream* firstAudio = nullptr;
     for (unsigned i = 0; i < ic->nb_streams && !firstAudio; ++i) {
@@ -196,7 +216,20 @@ int ProbeFile(const std::string& path, MediaFileInfo& info) {
         }
     }
     ReadTags(ic, firstAudio, info);
-    info.bitRate = ic->bit_rate ? ClampToInt32(ic->bit_rate) : -1;
+    std::int64_t bitRate = ic->bit_rate;
+    if (quick && bitRate == 0) {
+        // The timing pass that would have filled this in was skipped; do as it does: the
+        // streams' rates added up, else the file's size over its length.
+        for (unsigned i = 0; i < ic->nb_streams; ++i) {
+            bitRate += ic->streams[i]->codecpar->bit_rate;
+        }
+        const std::int64_t lengthUs = StreamDurationUs(ic->streams[0]);
+        const std::int64_t size = ic->pb ? avio_size(ic->pb) : -1;
+        if (bitRate == 0 && size > 0 && lengthUs > 0 && lengthUs != AV_NOPTS_VALUE) {
+            bitRate = av_rescale(size, 8 * 1000000, lengthUs);
+        }
+    }
+    info.bitRate = bitRate ? ClampToInt32(bitRate) : -1;
 
     std::int64_t audioUs = AV_NOPTS_VALUE;
     std::int64_t videoUs = AV_NOPTS_VALUE;

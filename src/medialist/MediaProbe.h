@@ -9,7 +9,16 @@
 
 #include "medialist/MediaFileInfo.h"
 
+struct AVFormatContext;
+
 namespace ac {
+
+// True when the container's header already said everything about its audio streams (codec,
+// rate, channels, length), so avformat_find_stream_info can be skipped: it reads and decodes
+// ahead, which costs many times the rest of an open. Raw PCM is always described fully; with
+// anyCodec, compressed audio is trusted too (except AAC, whose header may give half the rate
+// of an SBR stream): enough for probing, while a decoder set-up wants the full look.
+bool HeaderIsComplete(const AVFormatContext* ic, bool anyCodec = false);
 
 // 1 when the file could be opened (info then holds what was found), 0 when not.
 int ProbeFile(const std::string& path, MediaFileInfo& info);

@@ -153,6 +153,11 @@ protected:
         }
         WriteFile(*s_dir / "disc.bin", bin);
         WriteFile(*s_dir / "disc.cue", cue);
+        // The first two tracks as a cdrdao TOC; libcdio wants MSF and an absolute FILE path.
+        const size_t first = (s_tracks[0].frames() + kSectorFrames - 1) / kSectorFrames;
+        WriteFile(*s_dir / "disc.toc", "CD_DA\nTRACK AUDIO\nFILE \"" + *s_dir / "disc.bin" + "\" 0 " +
+                                           Msf(first) + "\nTRACK AUDIO\nFILE \"" + *s_dir / "disc.bin" +
+                                           "\" " + Msf(first) + " " + Msf(300) + "\n");
         // The same image, cut off in the middle of track 2.
         ASSERT_EQ(mkdir((*s_dir / "cut").c_str(), 0755), 0);
         WriteFile(*s_dir / "cut/disc.cue", cue);
@@ -187,6 +192,15 @@ TEST_F(CttCdTracks, TracksReadSampleExactToTheirLastSector) {
                                 [](std::int16_t s) { return s == 0; }));
         EXPECT_NEAR(TimeLines(r.out).back(), static_cast<double>(got.frames()) / 44100, 1e-3);
     }
+}
+
+TEST_F(CttCdTracks, TocImageReadsLikeTheCue) {
+    const std::string out = m_out / "toc.wav";
+    const ToolResult r = RunCtt(*s_dir / "disc.toc/Track02.cda", {}, out);
+    ASSERT_EQ(r.exitCode, 0) << r.err;
+    Pcm got;
+    ASSERT_TRUE(ReadWav(out, got));
+    EXPECT_TRUE(got.samples == s_tracks[1].samples);
 }
 
 TEST_F(CttCdTracks, MissingTrackAndUnreadableSectorFailCleanly) {

@@ -105,7 +105,8 @@ TEST_F(Probing, RawVideoNamesItsPixelFormat) {
 
 TEST_F(Probing, UnopenableFilesAnswerZeroWithNoDuration) {
     WriteFile(*s_dir / "empty.mp3", "");
-    for (const char* name : {"empty.mp3", "missing.wav", "missing.cue|1"}) {
+    WriteFile(*s_dir / "notes.mp3", "These are my notes, not music.\n");
+    for (const char* name : {"empty.mp3", "notes.mp3", "missing.wav", "missing.cue|1"}) {
         const MediaFileInfo info = Probe(name, 0);
         EXPECT_EQ(info.bitRate, 0) << name;
         EXPECT_EQ(info.hours + info.minutes + info.seconds + info.microseconds, 0) << name;

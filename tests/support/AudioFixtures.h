@@ -3,6 +3,7 @@
 // channel swap, a byte-order slip or a shift by one sample cannot pass), WAV files written and
 // read by walking their chunks, and the Debian ffmpeg command for compressed sources.
 
+#include <algorithm>
 #include <cstdint>
 #include <cstdio>
 #include <cstdlib>

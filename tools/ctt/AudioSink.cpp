@@ -1,5 +1,6 @@
 #include "AudioSink.h"
 
+#include <strings.h>
 #include <unistd.h>
 
 #include <cerrno>
@@ -196,7 +197,9 @@ bool AudioSink::Open(const CttOptions& options, const InputFormat& input,
                                            options.format.empty() ? nullptr : options.format.c_str(),
                                            output.c_str());
     if (r < 0 || !m_muxer) {
-        error = "no output format for \"" + output + "\": give -f or a known extension";
+        const bool ape = output.size() > 4 && strcasecmp(output.c_str() + output.size() - 4, ".ape") == 0;
+        error = ape ? "Monkey's Audio (ape) can be read but not written"
+                    : "no output format for \"" + output + "\": give -f or a known extension";
         return false;
     }
     const AVOutputFormat* format = m_muxer->oformat;

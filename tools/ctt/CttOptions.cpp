@@ -248,7 +248,7 @@ std::string MuxerForFormatWord(const std::string& word) {
         {"mp3", "mp3"},   {"wav", "wav"},   {"flac", "flac"}, {"ogg", "ogg"},
         {"au", "au"},     {"ac3", "ac3"},   {"mp2", "mp2"},   {"adts", "adts"},
         {"aac", "adts"},  {"m4a", "ipod"},  {"mp4", "mp4"},   {"ipod", "ipod"},
-        {"asf", "asf"},   {"wma", "asf"},
+        {"asf", "asf"},   {"wma", "asf"},   {"wmv", "asf"},   {"xwmv", "asf"},
     };
     auto it = kFormats.find(Lower(Trim(word)));
     return it == kFormats.end() ? std::string() : it->second;
@@ -275,6 +275,9 @@ std::string ApplyValue(CttOptions& o, const std::string& name, const std::string
         }
     } else if (name == "f") {
         o.format = MuxerForFormatWord(lowered);
+        if (lowered == "ape") {
+            return "Monkey's Audio (ape) can be read but not written";
+        }
         if (o.format.empty()) {
             return "unknown output format \"" + value + "\"";
         }

@@ -4,6 +4,7 @@
 #include <cstring>
 
 #include "Report.h"
+#include "medialist/MediaProbe.h"
 #include "Sources.h"
 
 extern "C" {
@@ -63,7 +64,7 @@ public:
             m_error = "cannot open input \"" + path + "\": " + AvError(r);
             return false;
         }
-        r = avformat_find_stream_info(m_format, nullptr);
+        r = HeaderIsComplete(m_format) ? 0 : avformat_find_stream_info(m_format, nullptr);
         if (r < 0) {
             m_error = "cannot read the streams of \"" + path + "\": " + AvError(r);
             return false;
@@ -228,8 +229,9 @@ public:
             const std::int64_t missing = m_declaredSamples - samplesSeen;
             const int rate = m_decoder->sample_rate;
             if (missing > rate / 2 && missing * 50 > m_declaredSamples) {
-                m_error = "the input is truncated: it ends " +
-                          std::to_string(static_cast<double>(missing) / rate) +
+                char seconds[32];
+                std::snprintf(seconds, sizeof seconds, "%.1f", static_cast<double>(missing) / rate);
+                m_error = std::string("the input is truncated: it ends ") + seconds +
                           " s before its stated length";
                 return false;
             }

@@ -42,6 +42,7 @@ public:
     const std::string& Error() const { return m_error; }
     // Tags the source itself knows (a cue sheet's titles); the command line wins over them.
     const std::map<std::string, std::string>& Tags() const { return m_tags; }
+    void SetTag(const std::string& word, const std::string& value) { m_tags[word] = value; }
 
 protected:
     std::string m_error;

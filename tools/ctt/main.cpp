@@ -11,6 +11,7 @@
 #include <cerrno>
 #include <cmath>
 #include <cstring>
+#include <filesystem>
 #include <memory>
 #include <string>
 #include <vector>
@@ -61,10 +62,9 @@ std::unique_ptr<AudioSource> OpenSource(const CttOptions& options, std::string& 
             auto source = OpenFileSource(span.audioPath, startUs, endUs, error);
             if (source) {
                 // The sheet's titles stand in for tags the command line does not give.
-                auto& tags = const_cast<std::map<std::string, std::string>&>(source->Tags());
-                if (!span.title.empty()) tags["title"] = span.title;
-                if (!span.performer.empty()) tags["author"] = span.performer;
-                if (!span.album.empty()) tags["album"] = span.album;
+                if (!span.title.empty()) source->SetTag("title", span.title);
+                if (!span.performer.empty()) source->SetTag("author", span.performer);
+                if (!span.album.empty()) source->SetTag("album", span.album);
             }
             return source;
         }
@@ -82,14 +82,8 @@ std::unique_ptr<AudioSource> OpenSource(const CttOptions& options, std::string& 
 }
 
 bool OutputFolderUsable(const std::string& output, std::string& error) {
-    std::string dir = output.substr(0, output.find_last_of('/') == std::string::npos
-                                           ? 0
-                                           : output.find_last_of('/'));
-    if (output.find('/') == std::string::npos) {
-        dir = ".";
-    } else if (dir.empty()) {
-        dir = "/";
-    }
+    const std::filesystem::path parent = std::filesystem::path(output).parent_path();
+    const std::string dir = parent.empty() ? std::string(".") : parent.string();
     struct stat st {};
     if (::stat(dir.c_str(), &st) != 0 || !S_ISDIR(st.st_mode)) {
         error = "the output folder \"" + dir + "\" does not exist";
@@ -240,7 +234,8 @@ int main(int argc, char** argv) {
     if (!options.ignored.empty()) {
         std::string names;
         for (const std::string& name : options.ignored) {
-            names += (names.empty() ? "-" : ", -") + name;
+            names += names.empty() ? "-" : ", -";
+            names += name;
         }
         ReportWarning("video options have no effect on an audio output: " + names);
     }
