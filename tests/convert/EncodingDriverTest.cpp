@@ -97,6 +97,8 @@ protected:
 };
 
 TEST_F(EncodingDriverTest, EveryBadToolEndsItsOwnRowAndTheOthersCarryOn) {
+    int threadsBefore = test::CountThreads();
+    int fdsBefore = test::CountOpenFds();
     MediaItem& ok1 = Add("ok1.wav");
     MediaItem& fail = Add("fail.wav");
     MediaItem& crash = Add("crash.wav");
@@ -122,6 +124,10 @@ TEST_F(EncodingDriverTest, EveryBadToolEndsItsOwnRowAndTheOthersCarryOn) {
     // The end of the run is posted once, however many passes saw it.
     driver->RunPass();
     EXPECT_EQ(host.RunFinished(), 1);
+    // Every reader and waiter is gone once the rows are, and so is every pipe.
+    list.Clear();
+    EXPECT_EQ(test::CountThreads(), threadsBefore);
+    EXPECT_EQ(test::CountOpenFds(), fdsBefore);
 }
 
 TEST_F(EncodingDriverTest, LaunchFailureFailsTheRowWithoutTouchingTheCounters) {

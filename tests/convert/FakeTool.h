@@ -33,6 +33,13 @@ inline bool WaitForProcessState(int pid, char state) {
     return false;
 }
 
+inline int CountThreads() {
+    int count = 0;
+    for ([[maybe_unused]] auto& entry : std::filesystem::directory_iterator("/proc/self/task"))
+        ++count;
+    return count;
+}
+
 inline int CountOpenFds() {
     int count = 0;
     for ([[maybe_unused]] auto& entry : std::filesystem::directory_iterator("/proc/self/fd"))
