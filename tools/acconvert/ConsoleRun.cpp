@@ -90,13 +90,13 @@ bool ConsoleRun::AllEnded() {
     return true;
 }
 
-void ConsoleRun::ReportEnded(int row, JobStatus status) {
+void ConsoleRun::ReportEnded(int row, JobStatus status, int overall) {
     MediaItem* item = GetItem(row);
     if (m_drawBar) std::fputs("\r\033[K", m_out);
     std::fprintf(m_out, "[%d/%d] %s: %s", row + 1, GetRowCount(), StatusWord(status),
                  item->sourcePath.c_str());
     if (status == JobStatus::Completed) std::fprintf(m_out, " -> %s", item->outputPath.c_str());
-    std::fputc('\n', m_out);
+    std::fprintf(m_out, " (all %d%%)\n", overall);
     if (status == JobStatus::Failed) {
         if (CEncodeProcess* child = item->process.load())
             for (const auto& line : child->ErrorLines())
@@ -105,6 +105,9 @@ void ConsoleRun::ReportEnded(int row, JobStatus status) {
 }
 
 void ConsoleRun::Draw(EncodingDriver& driver, bool final) {
+    double total = driver.GetRunTotalSeconds();
+    int overall = total > 0 ? static_cast<int>(driver.GetRunDoneSeconds() / total * 100) : 0;
+    overall = std::clamp(overall, 0, 100);
     for (int row = 0; row < GetRowCount(); ++row) {
         MediaItem* item = GetItem(row);
         JobStatus status = item->Status();
@@ -113,12 +116,10 @@ void ConsoleRun::Draw(EncodingDriver& driver, bool final) {
         if (status == JobStatus::Running && !m_drawBar)
             std::fprintf(m_out, "[%d/%d] converting: %s\n", row + 1, GetRowCount(),
                          item->sourcePath.c_str());
-        if (IsEnded(status) && status != JobStatus::Idle) ReportEnded(row, status);
+        if (IsEnded(status) && status != JobStatus::Idle) ReportEnded(row, status, overall);
         reported = status;
     }
     if (m_drawBar && !final) {
-        double total = driver.GetRunTotalSeconds();
-        int overall = total > 0 ? static_cast<int>(driver.GetRunDoneSeconds() / total * 100) : 0;
         std::string current;
         int percent = 0;
         for (int row = 0; row < GetRowCount(); ++row) {
@@ -131,7 +132,7 @@ void ConsoleRun::Draw(EncodingDriver& driver, bool final) {
         }
         if (current.size() > 28) current = current.substr(0, 25) + "...";
         std::fprintf(m_out, "\r\033[K%-28s %3d%% [%s] all %3d%%", current.c_str(), percent,
-                     Bar(percent).c_str(), std::clamp(overall, 0, 100));
+                     Bar(percent).c_str(), overall);
     }
     std::fflush(m_out);
 }

@@ -209,8 +209,10 @@ int main(int argc, char** argv) {
         std::fprintf(stderr, "acconvert: no profile named %s\n", options.profile.c_str());
         return 2;
     }
+    // The tool runs in the program's folder, so every path it gets must stand on its own.
     std::string outputDirectory =
         options.outputDirectory.empty() ? config.GetString("OutputDir") : options.outputDirectory;
+    outputDirectory = fs::absolute(outputDirectory).lexically_normal().string();
 
     DriverConfig driverConfig;
     driverConfig.maxProcesses = config.GetInt("max_processes");
@@ -233,7 +235,8 @@ int main(int argc, char** argv) {
     std::signal(SIGPIPE, SIG_IGN);
 
     console::ConsoleRun run(outputDirectory, ::isatty(STDOUT_FILENO) == 1, stdout);
-    for (const auto& file : options.files) AddSource(run, file, *profile);
+    for (const auto& file : options.files)
+        AddSource(run, fs::absolute(file).lexically_normal().string(), *profile);
 
     OutputNamer namer = [naming](int row, MediaItem& item, const std::string& directory,
                                  const std::string& lastOutput) {
