@@ -105,8 +105,8 @@ protected:
 
 TEST_F(AcconvertTest, CtrlCEndsTheChildrenAndLeavesNoPartialOutput) {
     // Writes a partial output under the final name (the last word), then hangs.
-    UseFakeTool("for last; do :; done; printf partial > \"$last\"; echo started >> '" + dir / "log" +
-                "'; exec sleep 600\n");
+    UseFakeTool("for last; do :; done; printf partial > \"$last\"; echo $$ >> '" + dir / "pids" +
+                "'; echo started >> '" + dir / "log" + "'; exec sleep 600\n");
     WriteWav(dir / "a.wav");
     WriteWav(dir / "b.wav");
     WriteWav(dir / "c.wav");
@@ -119,6 +119,9 @@ TEST_F(AcconvertTest, CtrlCEndsTheChildrenAndLeavesNoPartialOutput) {
     program.WaitForExit();
     EXPECT_EQ(program.ExitCode(), 130) << program.Output();
     EXPECT_TRUE(Outputs().empty());
+    std::ifstream pids(dir / "pids");
+    for (int pid; pids >> pid;)
+        EXPECT_TRUE(test::ProcessState(pid) == '?' || test::ProcessState(pid) == 'Z') << pid;
 }
 
 TEST_F(AcconvertTest, ExitsZeroOnlyWhenEveryFileCompleted) {
