@@ -69,21 +69,43 @@ std::string Iconv(std::string_view bytes, const char* from) {
     return out;
 }
 
-// Cyrillic sheets in 1251 are mostly letters in 0xC0..0xFF; Western sheets have an odd
-// accented letter among ASCII words.
-bool LooksCyrillic1251(std::string_view s) {
-    size_t high = 0;
-    size_t letters = 0;
-    for (char ch : s) {
-        auto c = static_cast<unsigned char>(ch);
-        if (c >= 0xC0) {
-            ++high;
+// Shift-JIS text is pairs of a lead byte and a trail byte, and most Japanese letters have
+// leads 0x81..0x9F, which Cyrillic or Western text in a Windows code page hardly uses.
+bool LooksShiftJis(std::string_view s) {
+    size_t leads = 0;
+    size_t lowLeads = 0;
+    for (size_t i = 0; i < s.size(); ++i) {
+        const auto c = static_cast<unsigned char>(s[i]);
+        if (c < 0x80 || (c >= 0xA1 && c <= 0xDF)) {
+            continue;
         }
-        if (c >= 0xC0 || std::isalpha(c)) {
-            ++letters;
+        if (!((c >= 0x81 && c <= 0x9F) || (c >= 0xE0 && c <= 0xFC)) || i + 1 >= s.size()) {
+            return false;
         }
+        const auto t = static_cast<unsigned char>(s[++i]);
+        if (t < 0x40 || t == 0x7F || t > 0xFC) {
+            return false;
+        }
+        ++leads;
+        lowLeads += c <= 0x9F;
     }
-    return high > 8 && high * 4 > letters;
+    return leads > 0 && lowLeads * 2 > leads;
+}
+
+// Cyrillic words in 1251 are runs of high bytes; Western text has an odd accented letter
+// among ASCII ones.
+bool LooksCyrillic1251(std::string_view s) {
+    size_t inRuns = 0;
+    size_t alone = 0;
+    for (size_t i = 0; i < s.size(); ++i) {
+        if (static_cast<unsigned char>(s[i]) < 0x80) {
+            continue;
+        }
+        const bool before = i > 0 && static_cast<unsigned char>(s[i - 1]) >= 0x80;
+        const bool after = i + 1 < s.size() && static_cast<unsigned char>(s[i + 1]) >= 0x80;
+        (before || after ? inRuns : alone) += 1;
+    }
+    return inRuns > alone;
 }
 
 std::string Upper(std::string_view s) {
@@ -208,6 +230,9 @@ std::string DecodeCueText(std::string_view bytes) {
     }
     if (IsValidUtf8(bytes)) {
         return std::string(bytes);
+    }
+    if (LooksShiftJis(bytes)) {
+        return Iconv(bytes, "SHIFT_JIS");
     }
     return Iconv(bytes, LooksCyrillic1251(bytes) ? "WINDOWS-1251" : "WINDOWS-1252");
 }

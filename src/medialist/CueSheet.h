@@ -40,8 +40,8 @@ struct CueSheetData {
     std::vector<CueSheetTrack> tracks;
 };
 
-// Turns the sheet's bytes into UTF-8: BOMs go, UTF-16 is converted, text that is not valid
-// UTF-8 is read as Windows-1251 when it looks Cyrillic and as Windows-1252 otherwise.
+// Turns the sheet's bytes into UTF-8: BOMs go, UTF-16 is converted, and text that is not
+// valid UTF-8 is read as Shift-JIS or Windows-1251 when it looks so, else as Windows-1252.
 std::string DecodeCueText(std::string_view bytes);
 
 CueSheetData ParseCueSheet(std::string_view bytes);

@@ -131,7 +131,8 @@ protected:
 
 class Profile final : public ParameterSet {
 public:
-    Profile() = default;
+    Profile();
+    ~Profile() override;
     // Loads at once; IsLoaded() tells whether the file gave a name.
     explicit Profile(std::string path);
 

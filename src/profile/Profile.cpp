@@ -43,6 +43,8 @@ struct Profile::OwnedList {
     std::vector<std::string_view> items;
 };
 
+Profile::Profile() = default;
+Profile::~Profile() = default;
 Profile::Profile(std::string path) { Load(std::move(path)); }
 
 ValueList Profile::KeepList(std::string_view listText) {

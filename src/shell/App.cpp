@@ -1,12 +1,17 @@
-// The program's entry: product strings, the language, then the window. Until the skinned main
-// window lands, the window is a plain frame that shows where the program found its data and
-// settings.
+// The program's entry, in this order: product strings and the language, the single-instance
+// check, then the main window. A second start ends here silently.
 
+#include "platform/Paths.h"
 #include "resources/Language.h"
 #include "resources/TextFormat.h"
 #include "shell/AppConfig.h"
+#include "shell/AudioEncDlg.h"
+#include "shell/TestHook.h"
 
+#include <wx/snglinst.h>
 #include <wx/wx.h>
+
+#include <memory>
 
 namespace {
 
@@ -16,8 +21,6 @@ constexpr int kContentsCommand = 32900;
 constexpr int kAboutCommand = 32903;
 
 constexpr std::uint32_t kSettingsSetAside = 0xC0C0;
-constexpr std::uint32_t kProgramDataLine = 0xC0C1;
-constexpr std::uint32_t kSettingsLine = 0xC0C2;
 
 wxString Text(std::uint32_t id, std::initializer_list<std::string_view> args = {}) {
     return wxString::FromUTF8(ac::FormatText(ac::g_Language.GetString(id), args));
@@ -47,26 +50,37 @@ public:
         SetAppDisplayName(wxString::FromUTF8(product.productName));
         ChooseLanguage(config);
 
+        // The lock lives in the user's data folder, so each user runs one copy.
+        const std::string lockDir = ac::platform::UserDataDirectory();
+        ac::platform::EnsureDirectory(lockDir);
+        m_instance = std::make_unique<wxSingleInstanceChecker>();
+        if (!m_instance->Create("cd-burner", wxString::FromUTF8(lockDir)) ||
+            m_instance->IsAnotherRunning()) {
+            return false;
+        }
+
         std::string setAside = config.TakeSetAsideNotice();
         if (!setAside.empty()) {
             wxMessageBox(Text(kSettingsSetAside, {setAside}),
                          wxString::FromUTF8(product.productFullName), wxOK | wxICON_WARNING);
         }
 
-        auto* frame = new wxFrame(nullptr, wxID_ANY, wxString::FromUTF8(product.productName),
-                                  wxDefaultPosition, wxSize(840, 634));
-        auto* panel = new wxPanel(frame);
-        auto* sizer = new wxBoxSizer(wxVERTICAL);
-        auto line = [&](const wxString& text) {
-            sizer->Add(new wxStaticText(panel, wxID_ANY, text), 0, wxALL, 8);
-        };
-        line(wxString::FromUTF8(product.productName));
-        line(Text(kProgramDataLine, {config.GetBaseDirectory()}));
-        line(Text(kSettingsLine, {config.SettingsFile()}));
-        panel->SetSizer(sizer);
-        frame->Show();
+        wxInitAllImageHandlers();
+        auto* dialog = new ac::CAudioEncDlg();
+        SetTopWindow(dialog);
+        dialog->OnInitDialog();
+        dialog->Show();
+        ac::StartTestHook(dialog);
         return true;
     }
+
+    int OnExit() override {
+        m_instance.reset();
+        return wxApp::OnExit();
+    }
+
+private:
+    std::unique_ptr<wxSingleInstanceChecker> m_instance;
 };
 
 }  // namespace

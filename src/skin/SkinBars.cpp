@@ -195,7 +195,7 @@ void ImCaptionBar::OnMouse(wxMouseEvent& event) {
     }
     if (event.LeftDown()) {
         if (auto* skinned = dynamic_cast<ImSkinDialog*>(top)) {
-            if (ImMenuBar* bar = skinned->GetMenuBar(false)) {
+            if (ImMenuBar* bar = skinned->GetSkinMenuBar(false)) {
                 bar->CloseMenus();
             }
         }

@@ -59,6 +59,8 @@ bool ImSkinDialog::OnSkinChanged(const std::string& skinDir) {
     }
     m_look.fillBg = NativeColour(static_cast<std::uint32_t>(fill));
     m_look.childBg = NativeColour(static_cast<std::uint32_t>(bg));
+    // Children that paint their own transparent parts (buttons) show this colour behind them.
+    m_hWnd->SetBackgroundColour(m_look.childBg);
     static const char* const kButtonKeys[4] = {"ButtonTextColor_Up", "ButtonTextColor_Down",
                                                "ButtonTextColor_Active",
                                                "ButtonTextColor_Disabled"};
@@ -133,7 +135,7 @@ void ImSkinDialog::ShowCaption(bool show) {
     RecalcLayout();
 }
 
-ImMenuBar* ImSkinDialog::GetMenuBar(bool create) {
+ImMenuBar* ImSkinDialog::GetSkinMenuBar(bool create) {
     if (m_menuBar == nullptr && create) {
         m_menuBar = new ImMenuBar(m_hWnd, this);
     }

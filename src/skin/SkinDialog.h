@@ -63,7 +63,7 @@ public:
 
     wxRect GetContentRect() const { return m_contentRect; }
     void ShowCaption(bool show);
-    ImMenuBar* GetMenuBar(bool create);
+    ImMenuBar* GetSkinMenuBar(bool create);
     ImCaptionBar* GetCaptionBar() const { return m_pCaptionBar; }
     const ImSkinConfig& Skin() const { return m_skin; }
     const SkinMetrics& Metrics() const { return m_metrics; }

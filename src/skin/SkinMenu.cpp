@@ -27,6 +27,23 @@ char Mnemonic(const wxString& text) {
     return SplitMnemonic(text.utf8_string()).second;
 }
 
+// Draws text with its '&' shown as an underline under the character that follows it.
+void DrawMnemonicLabel(wxDC& dc, const wxString& text, const wxRect& rect, int alignment) {
+    wxString plain;
+    int underline = -1;
+    for (std::size_t i = 0; i < text.length(); ++i) {
+        if (text[i] == '&' && i + 1 < text.length()) {
+            if (text[i + 1] != '&') {
+                underline = static_cast<int>(plain.length());
+            }
+            plain += text[++i];
+            continue;
+        }
+        plain += text[i];
+    }
+    dc.DrawLabel(plain, wxNullBitmap, rect, alignment, underline);
+}
+
 }  // namespace
 
 void PopupDestroyer::operator()(ImMenuPopup* popup) const {
@@ -50,6 +67,11 @@ ImMenuPopup::ImMenuPopup(wxWindow* owner, ImMenuBar* bar, const wxFont& font)
     Bind(wxEVT_LEFT_DOWN, &ImMenuPopup::OnMouse, this);
     Bind(wxEVT_LEFT_UP, &ImMenuPopup::OnMouse, this);
     Bind(wxEVT_LEAVE_WINDOW, &ImMenuPopup::OnMouse, this);
+}
+
+ImMenuPopup::~ImMenuPopup() {
+    // When the frame goes, wx frees every popup itself, the child included.
+    (void)m_pChild.release();
 }
 
 void ImMenuPopup::Measure() {
@@ -310,7 +332,8 @@ void ImMenuPopup::OnPaint(wxPaintEvent& /*event*/) {
         }
         dc.SetTextForeground(colour);
         const wxString label = text.BeforeFirst('\t');
-        dc.DrawLabel(label, wxRect(23, textY, m_width - 23, textHeight), wxALIGN_LEFT | wxALIGN_TOP);
+        DrawMnemonicLabel(dc, label, wxRect(23, textY, m_width - 23, textHeight),
+                          wxALIGN_LEFT | wxALIGN_TOP);
         if (text.Contains("\t")) {
             const wxString accel = text.AfterFirst('\t');
             dc.DrawText(accel, m_width - 20 - dc.GetTextExtent(accel).x, textY);
@@ -336,7 +359,14 @@ ImMenuBar::ImMenuBar(wxWindow* parent, ImSkinDialog* owner)
     Bind(wxEVT_MOUSE_CAPTURE_LOST, [this](wxMouseCaptureLostEvent&) { m_bDragging = false; });
 }
 
-ImMenuBar::~ImMenuBar() = default;
+ImMenuBar::~ImMenuBar() {
+    (void)m_popup.release();
+}
+
+void ImMenuBar::DestroyPopups() {
+    m_bOpen = false;
+    m_popup.reset();
+}
 
 void ImMenuBar::SetMenu(std::unique_ptr<ImMenu> menu) {
     CloseMenus();
@@ -402,7 +432,10 @@ void ImMenuBar::Measure() {
         const SkinRect& last = m_itemRects.back();
         SetSize(last.Right() + m_itemLeft + 2, last.Bottom() + m_marginTop);
     }
-    m_popup.reset(new ImMenuPopup(this, this, m_popupFont));
+    if (!m_popup) {
+        m_popup.reset(new ImMenuPopup(this, this, m_popupFont));
+    }
+    m_popup->SetPopupFont(m_popupFont);
     Refresh();
 }
 
@@ -443,7 +476,7 @@ int ImMenuBar::EntryAt(const wxPoint& point) const {
 }
 
 void ImMenuBar::OpenEntry(int index) {
-    if (!m_menu || index < 0 || index >= m_itemCount) {
+    if (!m_popup || !m_menu || index < 0 || index >= m_itemCount) {
         CloseMenus();
         return;
     }
@@ -458,6 +491,16 @@ void ImMenuBar::OpenEntry(int index) {
                                            m_popup->GetSize().y, barHeight, screen.x, screen.y);
     AnnouncePopup(menu);
     m_popup->ShowAt(x, y);
+}
+
+void ImMenuBar::OpenByIndex(int index) {
+    if (index < 0 || index >= m_itemCount) {
+        return;
+    }
+    m_bOpen = true;
+    m_hot = index;
+    Refresh(false);
+    OpenEntry(index);
 }
 
 void ImMenuBar::OnPaint(wxPaintEvent& /*event*/) {
@@ -492,7 +535,7 @@ void ImMenuBar::OnPaint(wxPaintEvent& /*event*/) {
             colour = i == m_hot ? m_colours.selectedText : m_colours.normalText;
         }
         dc.SetTextForeground(colour);
-        dc.DrawLabel(EntryText(i), wxRect(r.x, r.y, r.w, r.h), wxALIGN_CENTER);
+        DrawMnemonicLabel(dc, EntryText(i), wxRect(r.x, r.y, r.w, r.h), wxALIGN_CENTER);
     }
 }
 

@@ -34,7 +34,9 @@ using PopupPtr = std::unique_ptr<ImMenuPopup, PopupDestroyer>;
 class ImMenuPopup : public wxPopupWindow {
 public:
     ImMenuPopup(wxWindow* owner, ImMenuBar* bar, const wxFont& font);
+    ~ImMenuPopup() override;
     void SetMenu(wxMenu* menu) { m_pMenu = menu; }
+    void SetPopupFont(const wxFont& font) { m_font = font; }
     wxMenu* GetMenu() const { return m_pMenu; }
     void Measure();
     void ShowAt(int x, int y);
@@ -95,6 +97,8 @@ public:
     void SetColours(const MenuColours& colours) { m_colours = colours; Refresh(); }
     const MenuColours& Colours() const { return m_colours; }
     void CloseMenus();
+    // Before the owner goes: the popups are freed while the bar can still reach them.
+    void DestroyPopups();
     wxSize GetBarSize() const;
     bool OnSkinChanged(const std::string& skinDir) override;
     bool IsOpen() const { return m_bOpen; }
@@ -102,6 +106,8 @@ public:
     void CommandChosen();
     void AnnouncePopup(wxMenu* menu);
     ImMenuPopup* Popup() const { return m_popup.get(); }
+    // Enters open mode on entry index, as a click on it does.
+    void OpenByIndex(int index);
 
 private:
     void OnPaint(wxPaintEvent& event);

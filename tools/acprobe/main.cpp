@@ -6,6 +6,10 @@
 
 #include "medialist/MediaProbe.h"
 
+extern "C" {
+#include <libavutil/log.h>
+}
+
 namespace {
 
 void AppendEscaped(std::string& out, const std::string& text) {
@@ -109,6 +113,8 @@ int main(int argc, char** argv) {
         std::fputs("usage: acprobe FILE...\n", stderr);
         return 2;
     }
+    // Demuxer chatter ("estimating duration from bitrate") is no result of ours.
+    av_log_set_level(AV_LOG_QUIET);
     int status = 0;
     std::string batch;
     for (int i = 1; i < argc; ++i) {

@@ -10,6 +10,7 @@
 #include <vector>
 #include <algorithm>
 
+#include "Id3v1.h"
 #include "Report.h"
 
 extern "C" {
@@ -150,7 +151,10 @@ std::string TempPathFor(const std::string& output) {
     namespace fs = std::filesystem;
     fs::path out(output);
     fs::path dir = out.parent_path();
-    std::string name = "." + out.filename().string() + ".ctt" + std::to_string(::getpid()) + ".part";
+    // Beside the output, so the final rename stays on one file system; short enough for
+    // NAME_MAX even when the output's own name is near it.
+    std::string name = "." + out.filename().string().substr(0, 200) + ".ctt" +
+                       std::to_string(::getpid()) + ".part";
     return (dir / name).string();
 }
 
@@ -298,7 +302,11 @@ bool AudioSink::Open(const CttOptions& options, const InputFormat& input,
     AVDictionary* muxOptions = nullptr;
     if (mp3) {
         av_dict_set(&muxOptions, "id3v2_version", options.id3v2 ? "3" : "0", 0);
-        av_dict_set(&muxOptions, "write_id3v1", options.id3v1 ? "1" : "0", 0);
+        // The muxer's own ID3v1 depends on ID3v2 being on; Commit() appends ours.
+        av_dict_set(&muxOptions, "write_id3v1", "0", 0);
+        if (options.id3v1) {
+            m_id3v1 = BuildId3v1Tag(tags);
+        }
     }
     r = avformat_write_header(m_muxer, &muxOptions);
     av_dict_free(&muxOptions);
@@ -453,6 +461,16 @@ bool AudioSink::Commit(std::string& error) {
     if (r < 0) {
         error = "cannot finish the output file: " + AvError(r);
         return false;
+    }
+    if (!m_id3v1.empty()) {
+        const std::int64_t size = avio_size(m_muxer->pb);
+        if (size < 0 || avio_seek(m_muxer->pb, size, SEEK_SET) < 0) {
+            error = "cannot append the ID3v1 tag";
+            return false;
+        }
+        avio_write(m_muxer->pb, reinterpret_cast<const unsigned char*>(m_id3v1.data()),
+                   static_cast<int>(m_id3v1.size()));
+        avio_flush(m_muxer->pb);
     }
     r = avio_closep(&m_muxer->pb);
     if (r < 0) {

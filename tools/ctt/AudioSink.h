@@ -60,6 +60,7 @@ private:
     const CttOptions* m_options = nullptr;
     InputFormat m_input;
     std::string m_tempPath;
+    std::string m_id3v1;  // appended after the trailer when asked for
     AVFormatContext* m_muxer = nullptr;
     AVCodecContext* m_encoder = nullptr;
     AVStream* m_stream = nullptr;

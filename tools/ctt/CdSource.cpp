@@ -1,5 +1,6 @@
 #include <algorithm>
 #include <cctype>
+#include <sys/stat.h>
 #include <cstring>
 
 #include "Report.h"
@@ -96,6 +97,9 @@ public:
             return false;
         }
         m_end = end;
+        if (driver == DRIVER_BINCUE && !ImageHoldsTrack()) {
+            return false;
+        }
         ReadCdText(t);
 
         char* messages = nullptr;
@@ -164,6 +168,23 @@ public:
     }
 
 private:
+    // libcdio reads past the end of a cut-off .bin without complaint; a real drive would
+    // report those sectors unreadable, so say so before a short track goes out as complete.
+    bool ImageHoldsTrack() {
+        const char* bin = cdio_get_arg(m_cdio, "source");
+        struct stat st {};
+        if (!bin || ::stat(bin, &st) != 0) {
+            return true;
+        }
+        const auto sectors = static_cast<lsn_t>(st.st_size / CDIO_CD_FRAMESIZE_RAW);
+        if (sectors < m_end) {
+            m_error = "cannot read sector " + std::to_string(std::max(sectors, m_first)) +
+                      " of the disc: the image \"" + bin + "\" ends there";
+            return false;
+        }
+        return true;
+    }
+
     void ReadCdText(track_t t) {
         cdtext_t* text = cdio_get_cdtext(m_cdio);
         if (!text) {

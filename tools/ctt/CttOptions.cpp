@@ -295,7 +295,7 @@ std::string ApplyValue(CttOptions& o, const std::string& name, const std::string
             return bad("bit rate too high");
         }
     } else if (name == "ar") {
-        if (IsUnset(lowered)) {
+        if (IsUnset(lowered) || lowered == "0") {
             o.sampleRate = 0;
             return {};
         }
@@ -306,7 +306,7 @@ std::string ApplyValue(CttOptions& o, const std::string& name, const std::string
         }
         o.sampleRate = static_cast<int>(*rate);
     } else if (name == "ac") {
-        if (IsUnset(lowered)) {
+        if (IsUnset(lowered) || lowered == "0") {
             o.channels = 0;
             return {};
         }
@@ -385,6 +385,17 @@ ParseResult ParseArguments(const std::vector<std::string>& words) {
             result.error = "option " + word + " needs a value";
             return result;
         }
+        // The rip driver writes "-acodec" with an empty codec as a bare word before the next
+        // option; a value that is itself an option word is such a hole, not a value.
+        const std::string& next = words[i + 1];
+        const bool isTag = name == "title" || name == "author" || name == "album" ||
+                           name == "comment" || name == "copyright" || name == "genre" ||
+                           name == "composer" || name == "origaritist" || name == "url" ||
+                           name == "encodedby" || name == "year" || name == "timestamp";
+        if (!isTag && next.size() > 1 && next[0] == '-' && FindOption(next.substr(1)) &&
+            !std::isdigit(static_cast<unsigned char>(next[1]))) {
+            continue;
+        }
         const std::string& value = words[++i];
         if (def->use == Use::Honoured) {
             if (std::string error = ApplyValue(o, name, value); !error.empty()) {
@@ -395,7 +406,7 @@ ParseResult ParseArguments(const std::vector<std::string>& words) {
     }
     o.output = RestoreQuotes(words[last]);
     if (o.input.empty()) {
-        result.error = words.size() == 1 ? "no input given (-i)" : "no input given (-i)";
+        result.error = "no input given (-i)";
         return result;
     }
     if (o.output.empty() || o.output[0] == '-') {

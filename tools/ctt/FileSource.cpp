@@ -1,3 +1,8 @@
+#include <algorithm>
+#include <cmath>
+#include <cstdio>
+#include <cstring>
+
 #include "Report.h"
 #include "Sources.h"
 
@@ -13,6 +18,35 @@ std::string AvError(int code) {
     char text[AV_ERROR_MAX_STRING_SIZE] = {0};
     av_strerror(code, text, sizeof text);
     return text;
+}
+
+// The size the data chunk of a RIFF WAVE file claims; -1 when unknown or "as long as it gets"
+// (streamed WAVs write 0 or 0xFFFFFFFF there).
+std::int64_t WavClaimedDataBytes(const std::string& path) {
+    std::FILE* file = std::fopen(path.c_str(), "rb");
+    if (!file) {
+        return -1;
+    }
+    unsigned char head[12];
+    std::int64_t claimed = -1;
+    if (std::fread(head, 1, 12, file) == 12 && std::memcmp(head, "RIFF", 4) == 0) {
+        unsigned char chunk[8];
+        for (int guard = 0; guard < 64 && std::fread(chunk, 1, 8, file) == 8; ++guard) {
+            const std::uint32_t size = chunk[4] | (chunk[5] << 8) | (chunk[6] << 16) |
+                                       (static_cast<std::uint32_t>(chunk[7]) << 24);
+            if (std::memcmp(chunk, "data", 4) == 0) {
+                if (size != 0 && size != 0xFFFFFFFFu) {
+                    claimed = size;
+                }
+                break;
+            }
+            if (std::fseek(file, static_cast<long>(size + (size & 1)), SEEK_CUR) != 0) {
+                break;
+            }
+        }
+    }
+    std::fclose(file);
+    return claimed;
 }
 
 class FileSource final : public AudioSource {
@@ -80,6 +114,14 @@ public:
             m_declaredSamples = av_rescale_q(m_stream->duration, m_stream->time_base,
                                              AVRational{1, rate});
         }
+        if (std::strcmp(m_format->iformat->name, "wav") == 0) {
+            // FFmpeg trims a WAV's data size to the file; the header still tells what was meant.
+            const std::int64_t claimed = WavClaimedDataBytes(path);
+            const int blockAlign = m_stream->codecpar->block_align;
+            if (claimed > 0 && blockAlign > 0) {
+                m_declaredSamples = claimed / blockAlign;
+            }
+        }
         if (m_spanStart > 0) {
             SeekTo(0);
         }
@@ -129,9 +171,14 @@ public:
                 position = m_next - m_spanStart;
                 m_next += frame->nb_samples;
                 ++m_goodFrames;
-                if (m_spanEnd >= 0 && position >= m_spanEnd - m_spanStart) {
-                    av_frame_unref(frame);
-                    return 0;
+                if (m_spanEnd >= 0) {
+                    const std::int64_t left = m_spanEnd - m_spanStart - position;
+                    if (left <= 0) {
+                        av_frame_unref(frame);
+                        return 0;
+                    }
+                    // The next track starts inside this frame: hand out only our part.
+                    frame->nb_samples = static_cast<int>(std::min<std::int64_t>(frame->nb_samples, left));
                 }
                 return 1;
             }

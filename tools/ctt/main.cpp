@@ -203,6 +203,10 @@ int Convert(const CttOptions& options) {
         }
     }
     av_frame_free(&frame);
+    if (result == 0 && done == 0 && windowStart > 0) {
+        ReportError("the start time lies beyond the end of the input");
+        result = 1;
+    }
     if (result == 0 && sourceEnded && options.durationUs == 0 && !source->CheckComplete(spanReached)) {
         ReportError(source->Error());
         result = 1;
@@ -213,7 +217,8 @@ int Convert(const CttOptions& options) {
     }
     if (result == 0) {
         ReportTime(static_cast<double>(done) / rate);
-        ReportStatus("Done: " + options.output);
+        // The rip driver fails a track whose stdout holds "Error" anywhere: keep paths out.
+        ReportStatus("Done.");
     } else if (s_stopRequested) {
         ReportError("stopped");
     }

@@ -1,0 +1,281 @@
+// Starts the real program on the test's X display with a home of its own and drives it through
+// its test hook (AUDIOCONV_TEST_DIR): it reports what it shows in state.txt and runs the lines
+// of command.txt. Runs under xvfb-run.
+
+#include "../support/PackageDir.h"
+#include "../support/TempDir.h"
+
+#include <gtest/gtest.h>
+#include <signal.h>
+#include <sys/wait.h>
+#include <unistd.h>
+
+#include <chrono>
+#include <filesystem>
+#include <functional>
+#include <map>
+#include <thread>
+
+namespace {
+
+using namespace std::chrono_literals;
+using State = std::map<std::string, std::string>;
+
+class Program {
+public:
+    Program(const ac::test::TempDir& home, std::string executable = AC_BIN_DIR "/audio-converter")
+        : m_home(home.Path()), m_hook(home / "hook") {
+        std::filesystem::create_directories(m_hook);
+        std::filesystem::remove(m_hook + "/state.txt");
+        m_pid = ::fork();
+        if (m_pid == 0) {
+            ::setenv("HOME", m_home.c_str(), 1);
+            ::setenv("XDG_CONFIG_HOME", (m_home + "/.config").c_str(), 1);
+            ::setenv("XDG_DATA_HOME", (m_home + "/.local/share").c_str(), 1);
+            ::setenv("AUDIOCONV_TEST_DIR", m_hook.c_str(), 1);
+            ::setenv("AUDIOCONV_POWER_DRYRUN", (m_home + "/power.txt").c_str(), 1);
+            ::setenv("LANG", "C", 1);
+            ::execl(executable.c_str(), executable.c_str(), static_cast<char*>(nullptr));
+            ::_exit(127);
+        }
+    }
+    ~Program() {
+        if (Running()) {
+            ::kill(m_pid, SIGKILL);
+            ::waitpid(m_pid, nullptr, 0);
+        }
+    }
+
+    bool Running() {
+        if (m_exited) {
+            return false;
+        }
+        int status = 0;
+        if (::waitpid(m_pid, &status, WNOHANG) == m_pid) {
+            m_exited = true;
+            return false;
+        }
+        return true;
+    }
+
+    bool WaitForExit(std::chrono::seconds limit = 10s) {
+        const auto deadline = std::chrono::steady_clock::now() + limit;
+        while (std::chrono::steady_clock::now() < deadline) {
+            if (!Running()) {
+                return true;
+            }
+            std::this_thread::sleep_for(50ms);
+        }
+        return false;
+    }
+
+    State ReadState() const {
+        State state;
+        std::istringstream in(ac::test::ReadFile(m_hook + "/state.txt"));
+        std::string line;
+        while (std::getline(in, line)) {
+            const auto eq = line.find('=');
+            if (eq != std::string::npos) {
+                state[line.substr(0, eq)] = line.substr(eq + 1);
+            }
+        }
+        return state;
+    }
+
+    // Waits until the reported state satisfies the test; answers the last state seen.
+    State WaitFor(const std::function<bool(const State&)>& test, std::chrono::seconds limit = 20s) {
+        const auto deadline = std::chrono::steady_clock::now() + limit;
+        State state;
+        while (std::chrono::steady_clock::now() < deadline && Running()) {
+            state = ReadState();
+            if (!state.empty() && test(state)) {
+                return state;
+            }
+            std::this_thread::sleep_for(50ms);
+        }
+        return state;
+    }
+    State WaitShown() {
+        return WaitFor([](const State& s) { return s.count("title") > 0; });
+    }
+
+    void Send(const std::string& command) {
+        const std::string temp = m_hook + "/command.tmp";
+        ac::test::WriteFile(temp, command + "\n");
+        std::filesystem::rename(temp, m_hook + "/command.txt");
+    }
+
+    std::string Settings() const {
+        return ac::test::ReadFile(m_home + "/.config/audio-converter/settings.ini");
+    }
+
+private:
+    std::string m_home;
+    std::string m_hook;
+    pid_t m_pid = -1;
+    bool m_exited = false;
+};
+
+void WriteSettings(const ac::test::TempDir& home, const std::string& lines) {
+    ac::test::WriteFile(home / ".config/audio-converter/settings.ini",
+                        "[Software\\Velmorant\\Audio Converter\\Settings]\n" + lines);
+}
+
+class MainWindowTest : public ::testing::Test {
+protected:
+    void SetUp() override { ASSERT_NE(::getenv("DISPLAY"), nullptr) << "run under xvfb-run"; }
+    ac::test::TempDir m_home;
+};
+
+TEST_F(MainWindowTest, FirstStartIsCentredAtItsDefaultSizeAndClosingRemembersThePlace) {
+    {
+        Program program(m_home);
+        const State state = program.WaitShown();
+        EXPECT_EQ(state.at("title"), "Velmorant Audio Converter");
+        EXPECT_EQ(state.at("rect"), "220,195,840,634") << "centred on a 1280x1024 screen";
+        EXPECT_EQ(state.at("skin"), "Default");
+        program.Send("move 30 40 900 700");
+        program.WaitFor([](const State& s) { return s.at("rect") == "30,40,900,700"; });
+        program.Send("close");
+        ASSERT_TRUE(program.WaitForExit());
+        EXPECT_NE(program.Settings().find("window_rect=sz:30,40,930,740"), std::string::npos);
+        EXPECT_NE(program.Settings().find("last_skin=sz:Default"), std::string::npos);
+    }
+    Program again(m_home);
+    EXPECT_EQ(again.WaitShown().at("rect"), "30,40,900,700");
+}
+
+TEST_F(MainWindowTest, AbsurdRememberedRectanglesComeBackOnScreen) {
+    WriteSettings(m_home, "window_rect=sz:-500,-300,300,0\n");
+    {
+        Program program(m_home);
+        EXPECT_EQ(program.WaitShown().at("rect"), "0,0,840,634");
+    }
+    WriteSettings(m_home, "window_rect=sz:0,0,2000000000,5\n");
+    {
+        Program program(m_home);
+        EXPECT_EQ(program.WaitShown().at("rect"), "220,195,840,634");
+    }
+    WriteSettings(m_home, "window_rect=sz:garbage\n");
+    Program program(m_home);
+    EXPECT_EQ(program.WaitShown().at("rect"), "220,195,840,634");
+}
+
+TEST_F(MainWindowTest, ASecondStartEndsSilentlyWhileTheFirstRunsOn) {
+    Program first(m_home);
+    ASSERT_FALSE(first.WaitShown().empty());
+    ac::test::TempDir hookOfSecond;
+    Program second(m_home);
+    EXPECT_TRUE(second.WaitForExit(15s)) << "the second instance must end by itself";
+    EXPECT_TRUE(first.Running());
+    first.Send("tab 1");
+    EXPECT_EQ(first.WaitFor([](const State& s) { return s.at("mode") == "1"; }).at("mode"), "1");
+}
+
+TEST_F(MainWindowTest, SwitchingTabsSwitchesPanelMenuAndTheRememberedMode) {
+    Program program(m_home);
+    State state = program.WaitShown();
+    EXPECT_EQ(state.at("mode"), "0");
+    EXPECT_EQ(state.at("menu"), "129");
+    EXPECT_NE(state.at("visible").find("MediaList;"), std::string::npos);
+    EXPECT_EQ(state.at("tabs"), "Convert-|Rip+|Burn+|");
+
+    program.Send("tab 2");
+    state = program.WaitFor([](const State& s) { return s.at("mode") == "2"; });
+    EXPECT_EQ(state.at("menu"), "170");
+    EXPECT_EQ(state.at("captions"), "&File|&Edit|&Burn|&Options|&Help|");
+    EXPECT_NE(state.at("visible").find("CDCreatorPanel;"), std::string::npos);
+    EXPECT_EQ(state.at("visible").find("MediaList;"), std::string::npos);
+    EXPECT_EQ(state.at("tabs"), "Convert+|Rip+|Burn-|");
+    EXPECT_NE(program.Settings().find("last_run_function=dword:2"), std::string::npos);
+
+    program.Send("tab 1");
+    state = program.WaitFor([](const State& s) { return s.at("mode") == "1"; });
+    EXPECT_EQ(state.at("menu"), "171");
+    EXPECT_NE(state.at("visible").find("CDRip;"), std::string::npos);
+    EXPECT_EQ(state.at("visible").find("CDCreatorPanel;"), std::string::npos);
+    program.Send("close");
+    ASSERT_TRUE(program.WaitForExit());
+
+    Program again(m_home);
+    state = again.WaitShown();
+    EXPECT_EQ(state.at("mode"), "1");
+    EXPECT_EQ(state.at("menu"), "171");
+}
+
+std::string Screenshot(const ac::test::TempDir& dir, const std::string& name) {
+    const std::string path = dir / name;
+    const std::string command = "import -window root " + path + " 2>/dev/null";
+    EXPECT_EQ(std::system(command.c_str()), 0);
+    return ac::test::ReadFile(path);
+}
+
+TEST_F(MainWindowTest, ChangesOfSkinAndLanguageReachEveryWindow) {
+    Program program(m_home);
+    program.WaitShown();
+    std::this_thread::sleep_for(500ms);
+    const std::string before = Screenshot(m_home, "before.png");
+
+    program.Send("skin Midnight");
+    State state = program.WaitFor([](const State& s) { return s.at("skin") == "Midnight"; });
+    EXPECT_EQ(state.at("skin"), "Midnight");
+    std::this_thread::sleep_for(500ms);
+    EXPECT_NE(Screenshot(m_home, "after.png"), before) << "the window looks different";
+
+    program.Send("language German");
+    state = program.WaitFor([](const State& s) { return s.at("language") == "German"; });
+    EXPECT_EQ(state.at("captions"), "&Datei|&Bearbeiten|&Konvertieren|&Optionen|&Hilfe|");
+    EXPECT_EQ(state.at("exit"), "&Beenden");
+    EXPECT_EQ(state.at("tabs"), "Konvertieren-|Rippen+|Brennen+|");
+    program.Send("tab 2");
+    state = program.WaitFor([](const State& s) { return s.at("mode") == "2"; });
+    EXPECT_EQ(state.at("captions"), "&Datei|&Bearbeiten|&Brennen|&Optionen|&Hilfe|")
+        << "a menu loaded later is translated too";
+
+    program.Send("language English");
+    state = program.WaitFor([](const State& s) { return s.at("language") == "English"; });
+    EXPECT_EQ(state.at("tabs"), "Convert+|Rip+|Burn-|");
+    EXPECT_EQ(state.at("captions"), "&File|&Edit|&Burn|&Options|&Help|");
+    program.Send("close");
+    ASSERT_TRUE(program.WaitForExit());
+    EXPECT_NE(program.Settings().find("last_skin=sz:Midnight"), std::string::npos);
+}
+
+// A program folder of its own, with a data.pkg whose only skin is damaged in every way and
+// whose only other language lacks nearly all texts.
+TEST_F(MainWindowTest, DamagedSkinAndSparseLanguageFallBackWithoutACrash) {
+    ac::test::TempDir folder;
+    const std::string stage = folder / "stage";
+    const std::string png = ac::test::ReadFile(AC_SOURCE_DIR "/data/skin/Default/Card.png");
+    ac::test::WriteFile(stage + "/skin/Default/skin.ini",
+                        "[Main]\r\nName=Damaged\r\nBackground=half.png\r\nRegionLT=png.bmp\r\n"
+                        "RegionRB=missing.bmp\r\nMenuBarAlignment=7\r\nBorderWidth=-3\r\n"
+                        "[Caption]\r\nFontSize=-20\r\n[Check]\r\nTabConverterBg=half.png\r\n");
+    ac::test::WriteFile(stage + "/skin/Default/half.png", png.substr(0, png.size() / 2));
+    ac::test::WriteFile(stage + "/skin/Default/png.bmp", png);
+    ac::test::WriteFile(stage + "/skin/Default/SysMenu.bmp", "BM broken");
+    ac::test::WriteFile(stage + "/lang/Sparse.lang",
+                        "CODEPAGE=1252\r\nLANGCODE=xx\r\n#M8011# \"&Beenden\"\r\n");
+    const std::string pack = std::string(AC_BIN_DIR) + "/acpkg pack " + folder.Path() +
+                             "/data.pkg " + stage + " >/dev/null";
+    ASSERT_EQ(std::system(pack.c_str()), 0);
+    std::filesystem::copy_file(AC_BIN_DIR "/audio-converter", folder / "audio-converter");
+    std::filesystem::permissions(folder / "audio-converter", std::filesystem::perms::owner_all);
+
+    WriteSettings(m_home, "language=sz:Sparse\nlast_skin=sz:Gone\n");
+    Program program(m_home, folder / "audio-converter");
+    State state = program.WaitShown();
+    ASSERT_FALSE(state.empty()) << "the program started and showed its window";
+    EXPECT_EQ(state.at("skin"), "Default");
+    EXPECT_EQ(state.at("captions"), "&File|&Edit|&Convert|&Options|&Help|")
+        << "missing texts keep the built-in English";
+    EXPECT_EQ(state.at("exit"), "&Beenden");
+    EXPECT_EQ(state.at("tabs"), "Convert-|Rip+|Burn+|");
+    program.Send("tab 2");
+    EXPECT_EQ(program.WaitFor([](const State& s) { return s.at("mode") == "2"; }).at("menu"),
+              "170");
+    program.Send("close");
+    EXPECT_TRUE(program.WaitForExit());
+}
+
+}  // namespace
