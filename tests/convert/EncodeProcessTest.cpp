@@ -117,18 +117,6 @@ TEST_F(EncodeProcessTest, ReadsTimeStatusAndErrorLinesOfBothStreams) {
     EXPECT_EQ(recorder.log[2].second, LogLineKind::Normal);
 }
 
-TEST_F(EncodeProcessTest, ReplayShowsTheStoredLinesAgain) {
-    CEncodeProcess process(recorder.Callback());
-    ASSERT_TRUE(process.Launch(Tool("echo '|Error>>> one' >&2; echo two >&2\n")));
-    ASSERT_TRUE(recorder.WaitExits(1));
-    process.WaitForExit();
-    process.Link(&recorder, nullptr);
-    process.ReplayErrorLines();
-    std::lock_guard lock(recorder.mutex);
-    ASSERT_EQ(recorder.log.size(), 2u);
-    EXPECT_EQ(recorder.log[0].first, "one\n");
-}
-
 TEST_F(EncodeProcessTest, FloodOfErrorReadsKillsTheChildWithMinus100) {
     CEncodeProcess process(recorder.Callback());
     // Each write lands in a read of its own because the writer pauses in between.

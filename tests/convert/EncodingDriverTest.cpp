@@ -405,22 +405,6 @@ TEST_F(EncodingDriverTest, BusyListLockSkipsThePass) {
     EXPECT_EQ(item.Status(), JobStatus::Waiting);
 }
 
-TEST_F(EncodingDriverTest, RunFinishedPlaysTheSoundAndStartsTheAction) {
-    DriverConfig config;
-    config.playSound = 1;
-    config.soundPath = "/x/hint1.wav";
-    config.afterConvertAction = 3;
-    MakeDriver(config);
-    driver->OnRunFinished();
-    EXPECT_EQ(host.sounds, std::vector<std::string>{"/x/hint1.wav"});
-    EXPECT_EQ(host.actions, std::vector<int>{3});
-    config.afterConvertAction = 17;
-    config.playSound = 0;
-    MakeDriver(config);
-    driver->OnRunFinished();
-    EXPECT_EQ(host.Messages(), std::vector<std::string>{"abnormal completed action"});
-}
-
 struct EnableCase {
     const char* name;
     std::vector<JobStatus> checked;

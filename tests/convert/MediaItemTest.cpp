@@ -39,14 +39,6 @@ INSTANTIATE_TEST_SUITE_P(
         DurationCase{"SubSecondCutIsFull", 0, 0, 0, 999999, 0, 3600}),
     [](const auto& info) { return std::string(info.param.name); });
 
-TEST(MediaItemTest, ExitCodesMapToStatuses) {
-    EXPECT_EQ(StatusForExitCode(0), JobStatus::Completed);
-    EXPECT_EQ(StatusForExitCode(65535), JobStatus::Aborted);
-    EXPECT_EQ(StatusForExitCode(-100), JobStatus::Failed);
-    EXPECT_EQ(StatusForExitCode(1), JobStatus::Failed);
-    EXPECT_EQ(StatusForExitCode(128 + 9), JobStatus::Failed);
-}
-
 TEST(MediaItemTest, ZeroDurationGivesNoPercentInsteadOfInfinity) {
     MediaItem item;
     item.AdoptProcess(std::make_unique<CEncodeProcess>());
@@ -54,13 +46,6 @@ TEST(MediaItemTest, ZeroDurationGivesNoPercentInsteadOfInfinity) {
     item.info.seconds = 10;
     item.parameters = std::make_unique<test::FakeParameters>(0, 0);
     EXPECT_EQ(ProgressPercent(item), 0);
-}
-
-TEST(MediaItemTest, StatusTextsUseTheLanguageIds) {
-    EXPECT_EQ(StatusTextId(JobStatus::Failed), 123u);
-    EXPECT_EQ(StatusTextId(JobStatus::Idle), 0u);
-    EXPECT_EQ(StatusTextId(JobStatus::AbortedSuspended), 124u);
-    EXPECT_EQ(StatusTextId(static_cast<JobStatus>(42)), 0u);
 }
 
 }  // namespace

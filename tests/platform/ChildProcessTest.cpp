@@ -71,13 +71,6 @@ TEST_F(ChildProcessTest, WordsDirectoryAndExitCodeReachTheChild) {
     EXPECT_FALSE(child.IsRunning());
 }
 
-TEST_F(ChildProcessTest, CrashIsAFailureCode) {
-    Capture child;
-    ASSERT_TRUE(child.Launch(Tool("kill -SEGV $$\n")));
-    child.WaitForExit();
-    EXPECT_EQ(child.ExitCode(), 128 + SIGSEGV);
-}
-
 TEST_F(ChildProcessTest, KillReportsTheGivenCodeAndEndsTheWholeGroup) {
     Capture child;
     std::string marker = dir / "grandchild.pid";
