@@ -75,16 +75,23 @@ bool ParseArguments(int argc, char** argv, Options& options) {
     return !options.files.empty();
 }
 
-// A row's parameter set, seen by the engine through the little it needs.
+// A row's parameter set, seen by the engine through the little it needs. Reading the cut of a
+// set rebuilds its command line, so the progress display on the main thread would write the set
+// while the driver builds the row's command from it; nothing edits the set during a terminal
+// run, so the cut is read once, before any thread starts, and the set is the driver's alone.
 class ProfileParameters : public JobParameters {
 public:
-    explicit ProfileParameters(std::unique_ptr<ParameterSet> set) : m_set(std::move(set)) {}
-    std::int64_t GetDuration() const override { return m_set->GetDuration(); }
-    std::int64_t GetStartTime() const override { return m_set->GetStartTime(); }
+    explicit ProfileParameters(std::unique_ptr<ParameterSet> set)
+        : m_set(std::move(set)), m_duration(m_set->GetDuration()),
+          m_startTime(m_set->GetStartTime()) {}
+    std::int64_t GetDuration() const override { return m_duration; }
+    std::int64_t GetStartTime() const override { return m_startTime; }
     ParameterSet& Set() { return *m_set; }
 
 private:
     std::unique_ptr<ParameterSet> m_set;
+    const std::int64_t m_duration;
+    const std::int64_t m_startTime;
 };
 
 ParameterSet& SetOf(MediaItem& item) {
