@@ -16,6 +16,7 @@ for src in "$top"/tests/fuzz/fuzz_*.cpp; do
   case "$name" in
     fuzz_ini|fuzz_settings) seeds="$top/../shared/corpus/ini" ;;
     fuzz_language) seeds="$top/data/lang" ;;
+    fuzz_cue_sheet|fuzz_ctt_cue) seeds="$top/../shared/corpus/cue" ;;
     fuzz_package) seeds="$build/seeds/package"
       mkdir -p "$seeds" && cp -f "$build/bin/data.pkg" "$seeds/" 2>/dev/null || true ;;
     *) seeds="" ;;
