@@ -72,7 +72,8 @@ protected:
     bool Drive(Condition done) {
         for (int i = 0; i < 4000; ++i) {
             driver->RunPass();
-            if (done()) return true;
+            if (done())
+                return true;
             std::this_thread::sleep_for(std::chrono::milliseconds(5));
         }
         return false;
@@ -117,7 +118,8 @@ TEST_F(EncodingDriverTest, EveryBadToolEndsItsOwnRowAndTheOthersCarryOn) {
     EXPECT_EQ(driver->RunningCount(), 0);
     // Finished files stay whole; nothing a failed child wrote stands under a final name.
     EXPECT_EQ(test::ReadFile(ok1.outputPath), "partialdone");
-    for (MediaItem* failed : {&fail, &crash, &flood}) EXPECT_FALSE(fs::exists(failed->outputPath));
+    for (MediaItem* failed : {&fail, &crash, &flood})
+        EXPECT_FALSE(fs::exists(failed->outputPath));
     // Failed rows count whole, completed ones by their last time line.
     EXPECT_DOUBLE_EQ(driver->GetRunTotalSeconds(), 5.0);
     EXPECT_DOUBLE_EQ(driver->GetRunDoneSeconds(), 5.0);
@@ -211,8 +213,9 @@ TEST_P(PauseDuringLaunchTest, EndsPausedWithASuspendedChild) {
     EXPECT_TRUE(test::WaitForProcessState(item.process.load()->ProcessId(), 'T'));
 }
 
-INSTANTIATE_TEST_SUITE_P(Moments, PauseDuringLaunchTest, ::testing::Bool(),
-                         [](const auto& info) { return info.param ? "BeforeSpawn" : "AfterSpawn"; });
+INSTANTIATE_TEST_SUITE_P(Moments, PauseDuringLaunchTest, ::testing::Bool(), [](const auto& info) {
+    return info.param ? "BeforeSpawn" : "AfterSpawn";
+});
 
 TEST_F(EncodingDriverTest, StopBetweenNamingAndLaunchStartsNothingAndKeepsTheOldFile) {
     fs::create_directories(out);
@@ -266,7 +269,8 @@ TEST_P(StopEndsRunTest, OnlyTheMenuEntryForgetsTheRun) {
     ASSERT_TRUE(DriveTo(item, JobStatus::Running));
     fromMenu ? driver->StopCheckedFromMenu() : driver->StopChecked();
     ASSERT_TRUE(DriveToIdleCounters());
-    for (int i = 0; i < 3; ++i) driver->RunPass();
+    for (int i = 0; i < 3; ++i)
+        driver->RunPass();
     EXPECT_EQ(host.RunFinished(), fromMenu ? 0 : 1);
 }
 
@@ -415,7 +419,8 @@ class EnableRulesTest : public EncodingDriverTest,
                         public ::testing::WithParamInterface<EnableCase> {};
 
 TEST_P(EnableRulesTest, FollowTheStatusesOfTheCheckedRows) {
-    for (JobStatus status : GetParam().checked) Add("row.wav", status);
+    for (JobStatus status : GetParam().checked)
+        Add("row.wav", status);
     Add("unchecked.wav", JobStatus::Running);
     list.SetChecked(list.GetRowCount() - 1, false);
     EXPECT_EQ(driver->CanEncodeChecked(), GetParam().encode);
@@ -432,7 +437,8 @@ INSTANTIATE_TEST_SUITE_P(
                       EnableCase{"Waiting", {S::Idle, S::Waiting}, false, true, true},
                       EnableCase{"Pending", {S::Pending}, false, true, true},
                       EnableCase{"Paused", {S::Paused, S::Aborted}, true, false, true},
-                      EnableCase{"Suspended", {S::AbortedSuspended, S::UnknownFile}, true, false, false}),
+                      EnableCase{
+                          "Suspended", {S::AbortedSuspended, S::UnknownFile}, true, false, false}),
     [](const auto& info) { return std::string(info.param.name); });
 
 }  // namespace

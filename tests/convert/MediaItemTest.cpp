@@ -28,15 +28,14 @@ TEST_P(EffectiveDurationTest, CutsTheFileByDurationAndStart) {
 
 INSTANTIATE_TEST_SUITE_P(
     Cuts, EffectiveDurationTest,
-    ::testing::Values(
-        DurationCase{"Full", 2, 3, 500000, 0, 0, 3723.5},
-        // ss only counts when t is set.
-        DurationCase{"FullIgnoresStart", 0, 0, 0, 0, 60000000, 3600},
-        DurationCase{"CutShorterThanRest", 0, 0, 0, 90900000, 60000000, 90},
-        DurationCase{"CutLongerThanRest", 0, 0, 0, 7200000000, 1800000000, 1800},
-        DurationCase{"StartBeyondEnd", 0, 0, 0, 10000000, 7200000000, 3600},
-        // Fractions of a second in the cut are dropped.
-        DurationCase{"SubSecondCutIsFull", 0, 0, 0, 999999, 0, 3600}),
+    ::testing::Values(DurationCase{"Full", 2, 3, 500000, 0, 0, 3723.5},
+                      // ss only counts when t is set.
+                      DurationCase{"FullIgnoresStart", 0, 0, 0, 0, 60000000, 3600},
+                      DurationCase{"CutShorterThanRest", 0, 0, 0, 90900000, 60000000, 90},
+                      DurationCase{"CutLongerThanRest", 0, 0, 0, 7200000000, 1800000000, 1800},
+                      DurationCase{"StartBeyondEnd", 0, 0, 0, 10000000, 7200000000, 3600},
+                      // Fractions of a second in the cut are dropped.
+                      DurationCase{"SubSecondCutIsFull", 0, 0, 0, 999999, 0, 3600}),
     [](const auto& info) { return std::string(info.param.name); });
 
 TEST(MediaItemTest, ZeroDurationGivesNoPercentInsteadOfInfinity) {

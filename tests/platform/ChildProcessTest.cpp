@@ -52,7 +52,8 @@ protected:
     template <typename Match>
     static bool WaitFor(int pid, Match match) {
         for (int i = 0; i < 2000; ++i) {
-            if (match(test::ProcessState(pid))) return true;
+            if (match(test::ProcessState(pid)))
+                return true;
             std::this_thread::sleep_for(std::chrono::milliseconds(5));
         }
         return false;
@@ -63,8 +64,8 @@ protected:
 TEST_F(ChildProcessTest, WordsDirectoryAndExitCodeReachTheChild) {
     Capture child;
     child.SetCurrentDirectory(dir.Path());
-    ASSERT_TRUE(child.Launch(Tool("printf '[%s]' \"$@\"; pwd; exit 7\n") +
-                             "  -i \"a b.wav\" \"\" last"));
+    ASSERT_TRUE(
+        child.Launch(Tool("printf '[%s]' \"$@\"; pwd; exit 7\n") + "  -i \"a b.wav\" \"\" last"));
     child.WaitForExit();
     EXPECT_EQ(child.Out(), "[-i][a b.wav][][last]" + dir.Path() + "\n");
     EXPECT_EQ(child.Exits(), std::vector<int>{7});
