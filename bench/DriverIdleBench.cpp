@@ -37,12 +37,18 @@ void BM_IdleDriverCpu(benchmark::State& state) {
         driver.Start();
         std::this_thread::sleep_for(std::chrono::seconds(3));
         driver.Stop();
-        double wall = std::chrono::duration<double>(std::chrono::steady_clock::now() - wallBefore).count();
+        double wall =
+            std::chrono::duration<double>(std::chrono::steady_clock::now() - wallBefore).count();
         state.counters["cpu_percent_of_core"] = (ProcessCpuSeconds() - cpuBefore) / wall * 100.0;
     }
     list.Clear();
 }
-BENCHMARK(BM_IdleDriverCpu)->Args({1000, 0})->Args({1000, 1})->Iterations(1)->UseRealTime()->Unit(benchmark::kMillisecond);
+BENCHMARK(BM_IdleDriverCpu)
+    ->Args({1000, 0})
+    ->Args({1000, 1})
+    ->Iterations(1)
+    ->UseRealTime()
+    ->Unit(benchmark::kMillisecond);
 
 }  // namespace
 

@@ -22,7 +22,8 @@ std::string LineSplitter::Normalise(std::string text) {
     for (std::size_t i = 0; i < text.size(); ++i) {
         if (text[i] == '\r') {
             out.push_back('\n');
-            if (i + 1 < text.size() && text[i + 1] == '\n') ++i;
+            if (i + 1 < text.size() && text[i + 1] == '\n')
+                ++i;
         } else {
             out.push_back(text[i]);
         }
@@ -32,17 +33,21 @@ std::string LineSplitter::Normalise(std::string text) {
 
 // |Time>>> 73.48
 std::optional<double> ParseTimeLine(std::string_view line) {
-    if (!line.starts_with(kTimePrefix)) return std::nullopt;
+    if (!line.starts_with(kTimePrefix))
+        return std::nullopt;
     std::string_view number = line.substr(kTimePrefix.size());
     double value = 0.0;
     auto [end, error] = std::from_chars(number.data(), number.data() + number.size(), value);
-    if (error != std::errc()) return 0.0;
+    if (error != std::errc())
+        return 0.0;
     return value;
 }
 
 CEncodeProcess::CEncodeProcess(ExitCallback callback) : m_callback(std::move(callback)) {}
 
-CEncodeProcess::~CEncodeProcess() { StopAndJoin(); }
+CEncodeProcess::~CEncodeProcess() {
+    StopAndJoin();
+}
 
 std::vector<std::string> CEncodeProcess::ErrorLines() const {
     std::lock_guard lock(m_mutex);
@@ -64,9 +69,11 @@ void CEncodeProcess::ReplayErrorLines() {
     std::vector<std::string> lines = ErrorLines();
     {
         std::lock_guard lock(m_mutex);
-        if (m_log) m_log->Clear();
+        if (m_log)
+            m_log->Clear();
     }
-    for (const auto& line : lines) ShowLine(line);
+    for (const auto& line : lines)
+        ShowLine(line);
 }
 
 void CEncodeProcess::OnStart(const std::string& /*commandLine*/) {
@@ -74,8 +81,10 @@ void CEncodeProcess::OnStart(const std::string& /*commandLine*/) {
     m_stderrRest.Clear();
     std::lock_guard lock(m_mutex);
     m_errorLines.clear();
-    if (m_log) m_log->Clear();
-    if (m_status) m_status->SetStatusText("");
+    if (m_log)
+        m_log->Clear();
+    if (m_status)
+        m_status->SetStatusText("");
 }
 
 void CEncodeProcess::OnStdout(std::string_view text) {
@@ -85,7 +94,8 @@ void CEncodeProcess::OnStdout(std::string_view text) {
             return;
         }
         std::lock_guard lock(m_mutex);
-        if (m_status) m_status->SetStatusText(std::string(line));
+        if (m_status)
+            m_status->SetStatusText(std::string(line));
     });
 }
 
@@ -115,7 +125,8 @@ void CEncodeProcess::ShowLine(std::string_view line) {
         line.remove_prefix(kWarningPrefix.size());
     }
     std::lock_guard lock(m_mutex);
-    if (m_log) m_log->Append(std::string(line) + "\n", kind);
+    if (m_log)
+        m_log->Append(std::string(line) + "\n", kind);
 }
 
 void CEncodeProcess::OnExit(int /*exitCode*/) {
@@ -124,7 +135,8 @@ void CEncodeProcess::OnExit(int /*exitCode*/) {
         std::lock_guard lock(m_mutex);
         callback = m_callback;
     }
-    if (callback) callback(this);
+    if (callback)
+        callback(this);
 }
 
 std::string CEncodeProcess::LaunchFailureText(const std::string& commandLine) {

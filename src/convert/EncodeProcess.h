@@ -46,7 +46,8 @@ public:
         m_rest.append(text);
         std::string joined = Normalise(std::move(m_rest));
         std::size_t start = 0;
-        for (std::size_t end; (end = joined.find('\n', start)) != std::string::npos; start = end + 1)
+        for (std::size_t end; (end = joined.find('\n', start)) != std::string::npos;
+             start = end + 1)
             handler(std::string_view(joined).substr(start, end - start));
         m_rest = joined.substr(start);
     }

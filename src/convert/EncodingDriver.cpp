@@ -24,7 +24,9 @@ constexpr int kStoppedExitCode = 65535;
 bool IsBusy(JobStatus s) {  // blocks Encode, allows Pause
     return s == JobStatus::Running || s == JobStatus::Waiting || s == JobStatus::Pending;
 }
-bool IsStoppable(JobStatus s) { return IsBusy(s) || s == JobStatus::Paused; }
+bool IsStoppable(JobStatus s) {
+    return IsBusy(s) || s == JobStatus::Paused;
+}
 
 // Moves a status from one value to another unless a different thread changed it first.
 bool Move(MediaItem& item, JobStatus from, JobStatus to) {
@@ -40,7 +42,8 @@ std::uint64_t VolumeFreeBytes(const std::string& directory) {
 }  // namespace
 
 bool EnsureOutputDirectory(const std::string& directory) {
-    if (directory.empty()) return false;
+    if (directory.empty())
+        return false;
     std::error_code error;
     bool endsInSeparator = directory.back() == '/' || directory.back() == '\\';
     if (endsInSeparator ? fs::is_directory(directory, error) : fs::exists(directory, error))
@@ -51,10 +54,16 @@ bool EnsureOutputDirectory(const std::string& directory) {
 
 EncodingDriver::EncodingDriver(IMediaList& list, IDriverHost& host, DriverConfig config,
                                OutputNamer namer, CommandBuilder builder)
-    : m_list(list), m_host(host), m_config(std::move(config)), m_namer(std::move(namer)),
-      m_builder(std::move(builder)), m_freeSpace(VolumeFreeBytes) {}
+    : m_list(list),
+      m_host(host),
+      m_config(std::move(config)),
+      m_namer(std::move(namer)),
+      m_builder(std::move(builder)),
+      m_freeSpace(VolumeFreeBytes) {}
 
-EncodingDriver::~EncodingDriver() { Stop(); }
+EncodingDriver::~EncodingDriver() {
+    Stop();
+}
 
 void EncodingDriver::SetFreeSpaceProbe(std::function<std::uint64_t(const std::string&)> probe) {
     m_freeSpace = std::move(probe);
@@ -67,7 +76,8 @@ void EncodingDriver::SetLaunchHooks(std::function<void(int)> beforeLaunch,
 }
 
 void EncodingDriver::Start() {
-    if (m_thread.joinable()) return;
+    if (m_thread.joinable())
+        return;
     m_driverStop = 0;
     m_thread = std::thread(&EncodingDriver::ThreadMain, this);
 }
@@ -78,7 +88,8 @@ void EncodingDriver::Stop() {
         m_driverStop = 1;
     }
     m_wakeCondition.notify_all();
-    if (m_thread.joinable()) m_thread.join();
+    if (m_thread.joinable())
+        m_thread.join();
 }
 
 void EncodingDriver::Wake() {
@@ -104,10 +115,12 @@ void EncodingDriver::ThreadMain() {
 bool EncodingDriver::RunPass() {
     bool proceed = true;
     std::string lastOutput;
-    if (!m_list.TryLock()) return false;
+    if (!m_list.TryLock())
+        return false;
     for (int row = 0; row < m_list.GetRowCount(); ++row) {
         MediaItem* item = m_list.GetItem(row);
-        if (!item || !m_list.IsChecked(row)) continue;
+        if (!item || !m_list.IsChecked(row))
+            continue;
         if (!proceed) {
             item->SetStatus(JobStatus::Aborted);
             m_list.RefreshRow(row);
@@ -139,8 +152,7 @@ void EncodingDriver::StartRow(int row, MediaItem& item, bool& proceed, std::stri
         m_list.RefreshRow(row);
         return;
     }
-    if (m_processCount >= m_config.maxProcesses ||
-        m_runningCount >= m_config.maxRunningProcesses)
+    if (m_processCount >= m_config.maxProcesses || m_runningCount >= m_config.maxRunningProcesses)
         return;
 
     CEncodeProcess* child = item.process.load();
@@ -148,7 +160,8 @@ void EncodingDriver::StartRow(int row, MediaItem& item, bool& proceed, std::stri
         // A row stopped and encoded again may still have its last exit on the way; let it
         // settle first, or it would land on the new run.
         child->WaitForExit();
-        if (item.Status() != JobStatus::Waiting) return;
+        if (item.Status() != JobStatus::Waiting)
+            return;
     } else {
         item.AdoptProcess(std::make_unique<CEncodeProcess>(
             [this](CEncodeProcess* process) { OnProcessExit(process); }));
@@ -158,9 +171,11 @@ void EncodingDriver::StartRow(int row, MediaItem& item, bool& proceed, std::stri
     m_list.SelectOnly(row);
     item.outputPath = m_namer(row, item, directory, lastOutput);
     lastOutput = item.outputPath;
-    if (m_beforeLaunch) m_beforeLaunch(row);
+    if (m_beforeLaunch)
+        m_beforeLaunch(row);
     // Stopped by the user while it was being named: no child, and the old output stays.
-    if (item.Status() == JobStatus::Aborted) return;
+    if (item.Status() == JobStatus::Aborted)
+        return;
 
     std::string commandText = m_builder(item);
     std::error_code ignored;
@@ -175,7 +190,8 @@ void EncodingDriver::StartRow(int row, MediaItem& item, bool& proceed, std::stri
     ++m_runningCount;
     m_runPending = 1;
     m_finishPosted = 0;
-    if (m_afterLaunch) m_afterLaunch(row);
+    if (m_afterLaunch)
+        m_afterLaunch(row);
     // Paused while the launch was under way: the pause could not reach a child then, so the
     // driver completes it now.
     if (item.Status() == JobStatus::Idle && child->Suspend() &&
@@ -186,16 +202,20 @@ void EncodingDriver::StartRow(int row, MediaItem& item, bool& proceed, std::stri
 
 void EncodingDriver::ResumeRow(int row, MediaItem& item) {
     CEncodeProcess* child = item.process.load();
-    if (!child || !child->Resume()) return;
-    if (Move(item, JobStatus::Pending, JobStatus::Running)) ++m_runningCount;
+    if (!child || !child->Resume())
+        return;
+    if (Move(item, JobStatus::Pending, JobStatus::Running))
+        ++m_runningCount;
     m_list.RefreshRow(row);
 }
 
 void EncodingDriver::OnProcessExit(CEncodeProcess* process) {
-    if (!m_host.IsConvertMode()) return;
+    if (!m_host.IsConvertMode())
+        return;
     int row = FindRowOfProcess(process);
     MediaItem* item = row < 0 ? nullptr : m_list.GetItem(row);
-    if (!item) return;
+    if (!item)
+        return;
     JobStatus final = StatusForExitCode(process->ExitCode());
     // Whatever a failed or stopped child left is not a finished file; it must not stand under
     // the name a completed one would have.
@@ -205,8 +225,7 @@ void EncodingDriver::OnProcessExit(CEncodeProcess* process) {
     }
     --m_processCount;
     JobStatus old = item->status.exchange(final);
-    if (old != JobStatus::Paused && old != JobStatus::Pending &&
-        old != JobStatus::AbortedSuspended)
+    if (old != JobStatus::Paused && old != JobStatus::Pending && old != JobStatus::AbortedSuspended)
         --m_runningCount;
     m_list.RefreshRow(row);
     Wake();
@@ -215,7 +234,8 @@ void EncodingDriver::OnProcessExit(CEncodeProcess* process) {
 int EncodingDriver::FindRowOfProcess(const CEncodeProcess* process) {
     for (int row = 0; row < m_list.GetRowCount(); ++row) {
         MediaItem* item = m_list.GetItem(row);
-        if (item && item->process.load() == process) return row;
+        if (item && item->process.load() == process)
+            return row;
     }
     return -1;
 }
@@ -227,7 +247,8 @@ bool EncodingDriver::InSet(RowSet set, int row) {
 bool EncodingDriver::AnyInSet(RowSet set, bool (*match)(JobStatus)) {
     for (int row = 0; row < m_list.GetRowCount(); ++row) {
         MediaItem* item = m_list.GetItem(row);
-        if (item && InSet(set, row) && match(item->Status())) return true;
+        if (item && InSet(set, row) && match(item->Status()))
+            return true;
     }
     return false;
 }
@@ -244,25 +265,31 @@ void EncodingDriver::Encode(RowSet set) {
         }
     }
     for (int row = 0; row < m_list.GetRowCount(); ++row)
-        if (MediaItem* item = m_list.GetItem(row)) item->inRun = 0;
+        if (MediaItem* item = m_list.GetItem(row))
+            item->inRun = 0;
     for (int row = 0; row < m_list.GetRowCount(); ++row) {
         MediaItem* item = m_list.GetItem(row);
-        if (!item || !InSet(set, row)) continue;
+        if (!item || !InSet(set, row))
+            continue;
         switch (JobStatus status = item->Status()) {
-        case JobStatus::Idle:
-        case JobStatus::Failed:
-        case JobStatus::Aborted:
-        case JobStatus::AbortedSuspended:
-            if (Move(*item, status, JobStatus::Waiting)) item->inRun = 1;
-            break;
-        case JobStatus::Paused:
-            if (Move(*item, status, JobStatus::Pending)) item->inRun = 1;
-            break;
-        case JobStatus::Completed:
-            if (reencode) Move(*item, status, JobStatus::Waiting);
-            item->inRun = 1;
-            break;
-        default: break;  // unknown files never start; busy rows keep their way
+            case JobStatus::Idle:
+            case JobStatus::Failed:
+            case JobStatus::Aborted:
+            case JobStatus::AbortedSuspended:
+                if (Move(*item, status, JobStatus::Waiting))
+                    item->inRun = 1;
+                break;
+            case JobStatus::Paused:
+                if (Move(*item, status, JobStatus::Pending))
+                    item->inRun = 1;
+                break;
+            case JobStatus::Completed:
+                if (reencode)
+                    Move(*item, status, JobStatus::Waiting);
+                item->inRun = 1;
+                break;
+            default:
+                break;  // unknown files never start; busy rows keep their way
         }
         m_list.RefreshRow(row);
     }
@@ -274,31 +301,40 @@ void EncodingDriver::EncodeChecked() {
     Encode(RowSet::Checked);
 }
 
-void EncodingDriver::EncodeSelected() { Encode(RowSet::Selected); }
+void EncodingDriver::EncodeSelected() {
+    Encode(RowSet::Selected);
+}
 
 void EncodingDriver::Pause(RowSet set) {
     bool told = false;
     for (int row = 0; row < m_list.GetRowCount(); ++row) {
         MediaItem* item = m_list.GetItem(row);
-        if (!item || !InSet(set, row)) continue;
+        if (!item || !InSet(set, row))
+            continue;
         CEncodeProcess* child = item->process.load();
         switch (item->Status()) {
-        case JobStatus::Running:
-            if (child && child->IsRunning()) {
-                if (child->Suspend()) {
-                    if (Move(*item, JobStatus::Running, JobStatus::Paused)) --m_runningCount;
-                } else if (!told) {
-                    told = true;
-                    m_host.ShowMessage(g_Language.GetString(kSuspendUnavailableId), true);
+            case JobStatus::Running:
+                if (child && child->IsRunning()) {
+                    if (child->Suspend()) {
+                        if (Move(*item, JobStatus::Running, JobStatus::Paused))
+                            --m_runningCount;
+                    } else if (!told) {
+                        told = true;
+                        m_host.ShowMessage(g_Language.GetString(kSuspendUnavailableId), true);
+                    }
+                } else {
+                    // The launch is under way; the driver suspends the child once it stands.
+                    Move(*item, JobStatus::Running, JobStatus::Idle);
                 }
-            } else {
-                // The launch is under way; the driver suspends the child once it stands.
-                Move(*item, JobStatus::Running, JobStatus::Idle);
-            }
-            break;
-        case JobStatus::Waiting: Move(*item, JobStatus::Waiting, JobStatus::Idle); break;
-        case JobStatus::Pending: Move(*item, JobStatus::Pending, JobStatus::Paused); break;
-        default: break;
+                break;
+            case JobStatus::Waiting:
+                Move(*item, JobStatus::Waiting, JobStatus::Idle);
+                break;
+            case JobStatus::Pending:
+                Move(*item, JobStatus::Pending, JobStatus::Paused);
+                break;
+            default:
+                break;
         }
         m_list.RefreshRow(row);
     }
@@ -310,12 +346,15 @@ void EncodingDriver::PauseChecked() {
     Pause(RowSet::Checked);
 }
 
-void EncodingDriver::PauseSelected() { Pause(RowSet::Selected); }
+void EncodingDriver::PauseSelected() {
+    Pause(RowSet::Selected);
+}
 
 void EncodingDriver::StopRows(RowSet set) {
     for (int row = 0; row < m_list.GetRowCount(); ++row) {
         MediaItem* item = m_list.GetItem(row);
-        if (!item || !InSet(set, row)) continue;
+        if (!item || !InSet(set, row))
+            continue;
         JobStatus status = item->Status();
         if (status == JobStatus::Running)
             Move(*item, status, JobStatus::Aborted);
@@ -325,15 +364,18 @@ void EncodingDriver::StopRows(RowSet set) {
             Move(*item, status, JobStatus::Idle);
         // The counters follow when the exit arrives, through OnProcessExit.
         CEncodeProcess* child = item->process.load();
-        if (child && child->IsRunning()) child->Kill(kStoppedExitCode);
+        if (child && child->IsRunning())
+            child->Kill(kStoppedExitCode);
         m_list.RefreshRow(row);
     }
     Wake();
 }
 
 bool EncodingDriver::StopChecked(bool fromCommand) {
-    if (fromCommand) m_host.EnableTabStrip(true);
-    if (AnyActive(false) && !m_host.AskYesNo(kStopQuestionId)) return false;
+    if (fromCommand)
+        m_host.EnableTabStrip(true);
+    if (AnyActive(false) && !m_host.AskYesNo(kStopQuestionId))
+        return false;
     StopRows(RowSet::Checked);
     return true;
 }
@@ -343,7 +385,9 @@ bool EncodingDriver::StopCheckedFromMenu() {
     return StopChecked(true);
 }
 
-void EncodingDriver::StopSelected() { StopRows(RowSet::Selected); }
+void EncodingDriver::StopSelected() {
+    StopRows(RowSet::Selected);
+}
 
 bool EncodingDriver::CanEncodeChecked() {
     return m_list.GetRowCount() > 0 && !AnyInSet(RowSet::Checked, IsBusy);
@@ -351,26 +395,38 @@ bool EncodingDriver::CanEncodeChecked() {
 
 bool EncodingDriver::CanEncodeSelected() {
     for (int row = 0; row < m_list.GetRowCount(); ++row)
-        if (m_list.IsSelected(row)) return !AnyInSet(RowSet::Selected, IsBusy);
+        if (m_list.IsSelected(row))
+            return !AnyInSet(RowSet::Selected, IsBusy);
     return false;
 }
 
-bool EncodingDriver::CanPauseChecked() { return AnyInSet(RowSet::Checked, IsBusy); }
-bool EncodingDriver::CanPauseSelected() { return AnyInSet(RowSet::Selected, IsBusy); }
-bool EncodingDriver::CanStopChecked() { return AnyInSet(RowSet::Checked, IsStoppable); }
-bool EncodingDriver::CanStopSelected() { return AnyInSet(RowSet::Selected, IsStoppable); }
+bool EncodingDriver::CanPauseChecked() {
+    return AnyInSet(RowSet::Checked, IsBusy);
+}
+bool EncodingDriver::CanPauseSelected() {
+    return AnyInSet(RowSet::Selected, IsBusy);
+}
+bool EncodingDriver::CanStopChecked() {
+    return AnyInSet(RowSet::Checked, IsStoppable);
+}
+bool EncodingDriver::CanStopSelected() {
+    return AnyInSet(RowSet::Selected, IsStoppable);
+}
 
 bool EncodingDriver::UpdateCheckingEnabled() {
     bool enabled = CanEncodeChecked();
-    if (m_list.GetRowCount() > 0) m_list.EnableChecking(enabled);
-    if (enabled || m_list.GetRowCount() == 0) m_host.EnableTabStrip(true);
+    if (m_list.GetRowCount() > 0)
+        m_list.EnableChecking(enabled);
+    if (enabled || m_list.GetRowCount() == 0)
+        m_host.EnableTabStrip(true);
     return enabled;
 }
 
 bool EncodingDriver::AnyActive(bool includeWaiting) {
     for (int row = 0; row < m_list.GetRowCount(); ++row) {
         MediaItem* item = m_list.GetItem(row);
-        if (!item) continue;
+        if (!item)
+            continue;
         JobStatus s = item->Status();
         if (s == JobStatus::Running || s == JobStatus::Paused || s == JobStatus::Pending ||
             (includeWaiting && s == JobStatus::Waiting))
@@ -379,13 +435,16 @@ bool EncodingDriver::AnyActive(bool includeWaiting) {
     return false;
 }
 
-bool EncodingDriver::AnySelectedActive() { return AnyInSet(RowSet::Selected, IsStoppable); }
+bool EncodingDriver::AnySelectedActive() {
+    return AnyInSet(RowSet::Selected, IsStoppable);
+}
 
 double EncodingDriver::GetRunDoneSeconds() {
     double done = 0;
     for (int row = 0; row < m_list.GetRowCount(); ++row) {
         MediaItem* item = m_list.GetItem(row);
-        if (!item || item->inRun != 1) continue;
+        if (!item || item->inRun != 1)
+            continue;
         JobStatus s = item->Status();
         CEncodeProcess* child = item->process.load();
         if (s == JobStatus::Failed)
@@ -400,14 +459,16 @@ double EncodingDriver::GetRunTotalSeconds() {
     double total = 0;
     for (int row = 0; row < m_list.GetRowCount(); ++row) {
         MediaItem* item = m_list.GetItem(row);
-        if (item && item->inRun == 1) total += GetEffectiveDuration(*item);
+        if (item && item->inRun == 1)
+            total += GetEffectiveDuration(*item);
     }
     return total;
 }
 
 void EncodingDriver::OnRunFinished() {
     m_runPending = 0;
-    if (m_config.playSound) m_host.PlaySound(m_config.soundPath);
+    if (m_config.playSound)
+        m_host.PlaySound(m_config.soundPath);
     int action = m_config.afterConvertAction;
     if (action >= 0 && action <= 3)
         m_host.StartAfterRunAction(action);
@@ -416,8 +477,10 @@ void EncodingDriver::OnRunFinished() {
 }
 
 void EncodingDriver::CheckDiskSpace() {
-    if (!m_host.IsConvertMode() || !AnyActive(false)) return;
-    if (m_freeSpace(m_list.GetOutputDirectory()) >= kMinFreeBytes) return;
+    if (!m_host.IsConvertMode() || !AnyActive(false))
+        return;
+    if (m_freeSpace(m_list.GetOutputDirectory()) >= kMinFreeBytes)
+        return;
     StopChecked(false);
     m_host.ShowMessage(g_Language.GetString(kNotEnoughSpaceId), true);
 }

@@ -70,9 +70,8 @@ struct DriverConfig {
 
 // Names the output of a row from the directory and the name chosen last in this pass, so two
 // rows of one pass never pick the same free name.
-using OutputNamer = std::function<std::string(int row, MediaItem& item,
-                                              const std::string& directory,
-                                              const std::string& lastOutput)>;
+using OutputNamer = std::function<std::string(
+    int row, MediaItem& item, const std::string& directory, const std::string& lastOutput)>;
 // The text after the tool's name, for a row whose outputPath is set. May change the row's
 // parameters (a profile keeps what its last command line made of it).
 using CommandBuilder = std::function<std::string(MediaItem& item)>;

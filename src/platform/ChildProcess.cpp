@@ -44,7 +44,9 @@ struct Pipe {
 
 }  // namespace
 
-ImChildProcess::~ImChildProcess() { StopAndJoin(); }
+ImChildProcess::~ImChildProcess() {
+    StopAndJoin();
+}
 
 std::string ImChildProcess::LaunchFailureText(const std::string& commandLine) {
     return "Unable to start " + commandLine + "\n";
@@ -65,7 +67,8 @@ bool ImChildProcess::Launch(const std::string& commandLine, bool /*showWindow*/)
     pid_t pid = -1;
     if (piped && !words.empty()) {
         std::vector<char*> argv;
-        for (auto& word : words) argv.push_back(word.data());
+        for (auto& word : words)
+            argv.push_back(word.data());
         argv.push_back(nullptr);
 
         posix_spawn_file_actions_t actions;
@@ -82,12 +85,13 @@ bool ImChildProcess::Launch(const std::string& commandLine, bool /*showWindow*/)
         sigemptyset(&none);
         sigemptyset(&defaults);
         // The caller may ignore SIGPIPE or catch Ctrl-C; the tool must see the usual defaults.
-        for (int sig : {SIGPIPE, SIGINT, SIGTERM, SIGHUP, SIGQUIT}) sigaddset(&defaults, sig);
+        for (int sig : {SIGPIPE, SIGINT, SIGTERM, SIGHUP, SIGQUIT})
+            sigaddset(&defaults, sig);
         posix_spawnattr_setsigmask(&attr, &none);
         posix_spawnattr_setsigdefault(&attr, &defaults);
         posix_spawnattr_setpgroup(&attr, 0);
-        posix_spawnattr_setflags(&attr, POSIX_SPAWN_SETPGROUP | POSIX_SPAWN_SETSIGMASK |
-                                            POSIX_SPAWN_SETSIGDEF);
+        posix_spawnattr_setflags(
+            &attr, POSIX_SPAWN_SETPGROUP | POSIX_SPAWN_SETSIGMASK | POSIX_SPAWN_SETSIGDEF);
         spawnError = ::posix_spawn(&pid, argv[0], &actions, &attr, argv.data(), environ);
         posix_spawnattr_destroy(&attr);
         posix_spawn_file_actions_destroy(&actions);
@@ -131,13 +135,16 @@ void ImChildProcess::ReaderLoop(int fd, bool isError) {
     for (;;) {
         int ready = ::poll(fds, 2, -1);
         if (ready < 0) {
-            if (errno == EINTR) continue;
+            if (errno == EINTR)
+                continue;
             break;
         }
         if (fds[0].revents != 0) {
             ssize_t got = ::read(fd, buffer, kReadSize);
-            if (got < 0 && errno == EINTR) continue;
-            if (got <= 0) break;  // end of stream: every writer has gone
+            if (got < 0 && errno == EINTR)
+                continue;
+            if (got <= 0)
+                break;  // end of stream: every writer has gone
             buffer[got] = '\0';
             std::string_view text(buffer, static_cast<std::size_t>(got));
             if (isError)
@@ -146,7 +153,8 @@ void ImChildProcess::ReaderLoop(int fd, bool isError) {
                 OnStdout(text);
             continue;
         }
-        if (fds[1].revents != 0) break;
+        if (fds[1].revents != 0)
+            break;
     }
     ::close(fd);
     std::lock_guard lock(m_mutex);
@@ -163,7 +171,8 @@ void ImChildProcess::WaiterLoop() {
     // Wait without reaping: while the zombie stands, its pid and group id cannot be reused, so
     // a Kill or Suspend racing with the end never reaches a stranger.
     siginfo_t info{};
-    while (::waitid(P_PID, static_cast<id_t>(pid), &info, WEXITED | WNOWAIT) != 0 && errno == EINTR) {
+    while (::waitid(P_PID, static_cast<id_t>(pid), &info, WEXITED | WNOWAIT) != 0 &&
+           errno == EINTR) {
     }
     bool killed;
     {
@@ -172,7 +181,8 @@ void ImChildProcess::WaiterLoop() {
         m_exitedChanged.notify_all();
         m_exitedChanged.wait_for(lock, kDrainGrace, [this] { return m_readersLeft == 0; });
         killed = m_killed;
-        if (m_readersLeft != 0) ::kill(-pid, SIGKILL);  // a grandchild holds the pipes open
+        if (m_readersLeft != 0)
+            ::kill(-pid, SIGKILL);  // a grandchild holds the pipes open
     }
     m_running = 0;
     if (m_wakeWrite >= 0) {
@@ -203,21 +213,26 @@ bool ImChildProcess::IsRunning() const {
 
 bool ImChildProcess::Suspend() {
     std::lock_guard lock(m_mutex);
-    if (m_pid <= 0) return false;
-    if (m_exited) return true;
+    if (m_pid <= 0)
+        return false;
+    if (m_exited)
+        return true;
     return ::kill(-m_pid, SIGSTOP) == 0 || ::kill(m_pid, SIGSTOP) == 0;
 }
 
 bool ImChildProcess::Resume() {
     std::lock_guard lock(m_mutex);
-    if (m_pid <= 0) return false;
-    if (m_exited) return true;
+    if (m_pid <= 0)
+        return false;
+    if (m_exited)
+        return true;
     return ::kill(-m_pid, SIGCONT) == 0 || ::kill(m_pid, SIGCONT) == 0;
 }
 
 void ImChildProcess::Kill(int exitCode) {
     std::unique_lock lock(m_mutex);
-    if (m_pid <= 0 || m_exited) return;
+    if (m_pid <= 0 || m_exited)
+        return;
     m_killed = true;
     m_exitCode = exitCode;
     ::kill(-m_pid, SIGKILL);
@@ -227,7 +242,8 @@ void ImChildProcess::Kill(int exitCode) {
 
 void ImChildProcess::JoinThreads() {
     std::lock_guard join(m_joinMutex);
-    if (m_waitThread.joinable()) m_waitThread.join();
+    if (m_waitThread.joinable())
+        m_waitThread.join();
     CloseWakePipe();
 }
 
@@ -236,7 +252,9 @@ void ImChildProcess::CloseWakePipe() {
     CloseFd(m_wakeWrite);
 }
 
-void ImChildProcess::WaitForExit() { JoinThreads(); }
+void ImChildProcess::WaitForExit() {
+    JoinThreads();
+}
 
 void ImChildProcess::StopAndJoin() {
     Kill(65535);

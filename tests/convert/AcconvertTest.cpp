@@ -69,7 +69,8 @@ void WriteWav(const std::string& path, int seconds = 1) {
 class AcconvertTest : public ::testing::Test {
 protected:
     void SetUp() override {
-        if (::access(kAcconvert.c_str(), X_OK) != 0) GTEST_SKIP() << "acconvert is not built";
+        if (::access(kAcconvert.c_str(), X_OK) != 0)
+            GTEST_SKIP() << "acconvert is not built";
         // Settings and user profiles of the run stay in the temp folder.
         ::setenv("XDG_CONFIG_HOME", (dir / "config").c_str(), 1);
         ::setenv("XDG_DATA_HOME", (dir / "data").c_str(), 1);
@@ -80,21 +81,21 @@ protected:
                                   "[Parameter]\nacodec = 0, \"mp3\", \"mp3\"\n"
                                   "ab = 0, \"128\", \"128\"\nss = 0, \"0\", \"0\"\n";
     }
-    void TearDown() override {
-        ::unsetenv("AC_CTT_PATH");
-    }
+    void TearDown() override { ::unsetenv("AC_CTT_PATH"); }
     void UseFakeTool(const std::string& body) {
         ::setenv("AC_CTT_PATH", test::WriteScript(dir / "fake-ctt", body).c_str(), 1);
     }
     std::string Args(const std::vector<std::string>& files, int jobs = 2) {
-        std::string text = "\"" + kAcconvert + "\" --profile \"" + profile + "\" --jobs " + std::to_string(jobs) +
-                           " --out \"" + out + "\"";
-        for (const auto& file : files) text += " \"" + file + "\"";
+        std::string text = "\"" + kAcconvert + "\" --profile \"" + profile + "\" --jobs " +
+                           std::to_string(jobs) + " --out \"" + out + "\"";
+        for (const auto& file : files)
+            text += " \"" + file + "\"";
         return text;
     }
     std::vector<std::string> Outputs() {
         std::vector<std::string> names;
-        for (auto& entry : fs::directory_iterator(out)) names.push_back(entry.path().filename());
+        for (auto& entry : fs::directory_iterator(out))
+            names.push_back(entry.path().filename());
         std::sort(names.begin(), names.end());
         return names;
     }
@@ -105,8 +106,8 @@ protected:
 
 TEST_F(AcconvertTest, CtrlCEndsTheChildrenAndLeavesNoPartialOutput) {
     // Writes a partial output under the final name (the last word), then hangs.
-    UseFakeTool("for last; do :; done; printf partial > \"$last\"; echo started >> '" + dir / "log" +
-                "'; exec sleep 600\n");
+    UseFakeTool("for last; do :; done; printf partial > \"$last\"; echo $$ >> '" + dir / "pids" +
+                "'; echo started >> '" + dir / "log" + "'; exec sleep 600\n");
     WriteWav(dir / "a.wav");
     WriteWav(dir / "b.wav");
     WriteWav(dir / "c.wav");
@@ -119,11 +120,15 @@ TEST_F(AcconvertTest, CtrlCEndsTheChildrenAndLeavesNoPartialOutput) {
     program.WaitForExit();
     EXPECT_EQ(program.ExitCode(), 130) << program.Output();
     EXPECT_TRUE(Outputs().empty());
+    std::ifstream pids(dir / "pids");
+    for (int pid; pids >> pid;)
+        EXPECT_TRUE(test::ProcessState(pid) == '?' || test::ProcessState(pid) == 'Z') << pid;
 }
 
 TEST_F(AcconvertTest, ExitsZeroOnlyWhenEveryFileCompleted) {
-    UseFakeTool("for last; do :; done\ncase \"$*\" in *bad.wav*) exit 3;; esac\n"
-                "echo '|Time>>> 1'; printf mp3 > \"$last\"\n");
+    UseFakeTool(
+        "for last; do :; done\ncase \"$*\" in *bad.wav*) exit 3;; esac\n"
+        "echo '|Time>>> 1'; printf mp3 > \"$last\"\n");
     WriteWav(dir / "good.wav");
     WriteWav(dir / "bad.wav");
     {
@@ -141,13 +146,15 @@ TEST_F(AcconvertTest, ExitsZeroOnlyWhenEveryFileCompleted) {
 }
 
 TEST_F(AcconvertTest, RealConversionsOfFilesAndCueTracks) {
-    if (::access(kCtt.c_str(), X_OK) != 0) GTEST_SKIP() << "ctt is not built";
+    if (::access(kCtt.c_str(), X_OK) != 0)
+        GTEST_SKIP() << "ctt is not built";
     WriteWav(dir / "one.wav");
     WriteWav(dir / "album.wav", 4);
-    std::ofstream(dir / "album.cue") << "PERFORMER \"Artist\"\nTITLE \"Album\"\n"
-                                        "FILE \"album.wav\" WAVE\n"
-                                        "  TRACK 01 AUDIO\n    TITLE \"First\"\n    INDEX 01 00:00:00\n"
-                                        "  TRACK 02 AUDIO\n    TITLE \"Second\"\n    INDEX 01 00:02:00\n";
+    std::ofstream(dir / "album.cue")
+        << "PERFORMER \"Artist\"\nTITLE \"Album\"\n"
+           "FILE \"album.wav\" WAVE\n"
+           "  TRACK 01 AUDIO\n    TITLE \"First\"\n    INDEX 01 00:00:00\n"
+           "  TRACK 02 AUDIO\n    TITLE \"Second\"\n    INDEX 01 00:02:00\n";
     Program program;
     ASSERT_TRUE(program.Launch(Args({dir / "one.wav", dir / "album.cue"})));
     program.WaitForExit();
@@ -155,7 +162,8 @@ TEST_F(AcconvertTest, RealConversionsOfFilesAndCueTracks) {
     // Cue tracks are named by their titles, as the list names them.
     EXPECT_EQ(Outputs(), (std::vector<std::string>{"First.mp3", "Second.mp3", "one.mp3"}))
         << program.Output();
-    for (const auto& name : Outputs()) EXPECT_GT(fs::file_size(out + "/" + name), 0u) << name;
+    for (const auto& name : Outputs())
+        EXPECT_GT(fs::file_size(out + "/" + name), 0u) << name;
 }
 
 }  // namespace

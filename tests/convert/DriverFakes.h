@@ -29,8 +29,7 @@ public:
         bool selected = false;
     };
 
-    MediaItem& Add(const std::string& source, JobStatus status = JobStatus::Idle,
-                   int seconds = 1) {
+    MediaItem& Add(const std::string& source, JobStatus status = JobStatus::Idle, int seconds = 1) {
         auto item = std::make_unique<MediaItem>();
         item->sourcePath = source;
         item->info.seconds = seconds;
@@ -45,7 +44,8 @@ public:
     }
     void Select(int row) {
         std::lock_guard lock(m_mutex);
-        for (std::size_t i = 0; i < m_rows.size(); ++i) m_rows[i].selected = int(i) == row;
+        for (std::size_t i = 0; i < m_rows.size(); ++i)
+            m_rows[i].selected = int(i) == row;
     }
     // Items go outside the lock: their children's exits call back into the list.
     void Clear() {

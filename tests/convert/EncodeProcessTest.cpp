@@ -33,13 +33,12 @@ TEST_P(LineSplitterTest, JoinsReadsIntoLines) {
 
 INSTANTIATE_TEST_SUITE_P(
     Reads, LineSplitterTest,
-    ::testing::Values(
-        SplitCase{"CutLine", {"|Ti", "me>>> 12.5\n"}, {"|Time>>> 12.5"}, ""},
-        SplitCase{"AllEnds", {"a\nb\r\nc\rd"}, {"a", "b", "c"}, "d"},
-        // A CR LF that two reads cut apart gives one empty line more.
-        SplitCase{"SplitCrLf", {"a\r", "\nb\n"}, {"a", "", "b"}, ""},
-        SplitCase{"EmptyLines", {"\n\n"}, {"", ""}, ""},
-        SplitCase{"NoEndStays", {"no end", " at all"}, {}, "no end at all"}),
+    ::testing::Values(SplitCase{"CutLine", {"|Ti", "me>>> 12.5\n"}, {"|Time>>> 12.5"}, ""},
+                      SplitCase{"AllEnds", {"a\nb\r\nc\rd"}, {"a", "b", "c"}, "d"},
+                      // A CR LF that two reads cut apart gives one empty line more.
+                      SplitCase{"SplitCrLf", {"a\r", "\nb\n"}, {"a", "", "b"}, ""},
+                      SplitCase{"EmptyLines", {"\n\n"}, {"", ""}, ""},
+                      SplitCase{"NoEndStays", {"no end", " at all"}, {}, "no end at all"}),
     [](const auto& info) { return std::string(info.param.name); });
 
 TEST(ParseTimeLineTest, PrefixIsExactAndNumbersAreLenient) {
@@ -97,12 +96,13 @@ protected:
 TEST_F(EncodeProcessTest, ReadsTimeStatusAndErrorLinesOfBothStreams) {
     CEncodeProcess process(recorder.Callback());
     process.Link(&recorder, &recorder);
-    ASSERT_TRUE(process.Launch(Tool("printf '|Ti'; sleep 0.05; printf 'me>>> 3.25\\rOpening\\r\\n'\n"
-                                    "echo '|Error>>> bad frame' >&2\n"
-                                    "echo '|Warning>>> clipped' >&2\n"
-                                    "echo plain >&2\n"
-                                    "printf 'tail without end'\n"
-                                    "exit 3\n")));
+    ASSERT_TRUE(
+        process.Launch(Tool("printf '|Ti'; sleep 0.05; printf 'me>>> 3.25\\rOpening\\r\\n'\n"
+                            "echo '|Error>>> bad frame' >&2\n"
+                            "echo '|Warning>>> clipped' >&2\n"
+                            "echo plain >&2\n"
+                            "printf 'tail without end'\n"
+                            "exit 3\n")));
     ASSERT_TRUE(recorder.WaitExits(1));
     process.WaitForExit();
     EXPECT_EQ(process.ExitCode(), 3);
@@ -115,18 +115,6 @@ TEST_F(EncodeProcessTest, ReadsTimeStatusAndErrorLinesOfBothStreams) {
     EXPECT_EQ(recorder.log[0], std::make_pair(std::string("bad frame\n"), LogLineKind::Error));
     EXPECT_EQ(recorder.log[1], std::make_pair(std::string("clipped\n"), LogLineKind::Warning));
     EXPECT_EQ(recorder.log[2].second, LogLineKind::Normal);
-}
-
-TEST_F(EncodeProcessTest, ReplayShowsTheStoredLinesAgain) {
-    CEncodeProcess process(recorder.Callback());
-    ASSERT_TRUE(process.Launch(Tool("echo '|Error>>> one' >&2; echo two >&2\n")));
-    ASSERT_TRUE(recorder.WaitExits(1));
-    process.WaitForExit();
-    process.Link(&recorder, nullptr);
-    process.ReplayErrorLines();
-    std::lock_guard lock(recorder.mutex);
-    ASSERT_EQ(recorder.log.size(), 2u);
-    EXPECT_EQ(recorder.log[0].first, "one\n");
 }
 
 TEST_F(EncodeProcessTest, FloodOfErrorReadsKillsTheChildWithMinus100) {
@@ -142,7 +130,8 @@ TEST_F(EncodeProcessTest, FloodOfErrorReadsKillsTheChildWithMinus100) {
 
 TEST_F(EncodeProcessTest, ErrorReadsCarryOverToTheNextRun) {
     CEncodeProcess process(recorder.Callback());
-    std::string tool = Tool("i=0; while [ $i -lt 60 ]; do echo x >&2; sleep 0.002; i=$((i+1)); done\n");
+    std::string tool =
+        Tool("i=0; while [ $i -lt 60 ]; do echo x >&2; sleep 0.002; i=$((i+1)); done\n");
     ASSERT_TRUE(process.Launch(tool));
     ASSERT_TRUE(recorder.WaitExits(1));
     process.WaitForExit();

@@ -72,7 +72,8 @@ protected:
     bool Drive(Condition done) {
         for (int i = 0; i < 4000; ++i) {
             driver->RunPass();
-            if (done()) return true;
+            if (done())
+                return true;
             std::this_thread::sleep_for(std::chrono::milliseconds(5));
         }
         return false;
@@ -97,6 +98,8 @@ protected:
 };
 
 TEST_F(EncodingDriverTest, EveryBadToolEndsItsOwnRowAndTheOthersCarryOn) {
+    int threadsBefore = test::CountThreads();
+    int fdsBefore = test::CountOpenFds();
     MediaItem& ok1 = Add("ok1.wav");
     MediaItem& fail = Add("fail.wav");
     MediaItem& crash = Add("crash.wav");
@@ -115,13 +118,18 @@ TEST_F(EncodingDriverTest, EveryBadToolEndsItsOwnRowAndTheOthersCarryOn) {
     EXPECT_EQ(driver->RunningCount(), 0);
     // Finished files stay whole; nothing a failed child wrote stands under a final name.
     EXPECT_EQ(test::ReadFile(ok1.outputPath), "partialdone");
-    for (MediaItem* failed : {&fail, &crash, &flood}) EXPECT_FALSE(fs::exists(failed->outputPath));
+    for (MediaItem* failed : {&fail, &crash, &flood})
+        EXPECT_FALSE(fs::exists(failed->outputPath));
     // Failed rows count whole, completed ones by their last time line.
     EXPECT_DOUBLE_EQ(driver->GetRunTotalSeconds(), 5.0);
     EXPECT_DOUBLE_EQ(driver->GetRunDoneSeconds(), 5.0);
     // The end of the run is posted once, however many passes saw it.
     driver->RunPass();
     EXPECT_EQ(host.RunFinished(), 1);
+    // Every reader and waiter is gone once the rows are, and so is every pipe.
+    list.Clear();
+    EXPECT_EQ(test::CountThreads(), threadsBefore);
+    EXPECT_EQ(test::CountOpenFds(), fdsBefore);
 }
 
 TEST_F(EncodingDriverTest, LaunchFailureFailsTheRowWithoutTouchingTheCounters) {
@@ -205,8 +213,9 @@ TEST_P(PauseDuringLaunchTest, EndsPausedWithASuspendedChild) {
     EXPECT_TRUE(test::WaitForProcessState(item.process.load()->ProcessId(), 'T'));
 }
 
-INSTANTIATE_TEST_SUITE_P(Moments, PauseDuringLaunchTest, ::testing::Bool(),
-                         [](const auto& info) { return info.param ? "BeforeSpawn" : "AfterSpawn"; });
+INSTANTIATE_TEST_SUITE_P(Moments, PauseDuringLaunchTest, ::testing::Bool(), [](const auto& info) {
+    return info.param ? "BeforeSpawn" : "AfterSpawn";
+});
 
 TEST_F(EncodingDriverTest, StopBetweenNamingAndLaunchStartsNothingAndKeepsTheOldFile) {
     fs::create_directories(out);
@@ -260,7 +269,8 @@ TEST_P(StopEndsRunTest, OnlyTheMenuEntryForgetsTheRun) {
     ASSERT_TRUE(DriveTo(item, JobStatus::Running));
     fromMenu ? driver->StopCheckedFromMenu() : driver->StopChecked();
     ASSERT_TRUE(DriveToIdleCounters());
-    for (int i = 0; i < 3; ++i) driver->RunPass();
+    for (int i = 0; i < 3; ++i)
+        driver->RunPass();
     EXPECT_EQ(host.RunFinished(), fromMenu ? 0 : 1);
 }
 
@@ -399,22 +409,6 @@ TEST_F(EncodingDriverTest, BusyListLockSkipsThePass) {
     EXPECT_EQ(item.Status(), JobStatus::Waiting);
 }
 
-TEST_F(EncodingDriverTest, RunFinishedPlaysTheSoundAndStartsTheAction) {
-    DriverConfig config;
-    config.playSound = 1;
-    config.soundPath = "/x/hint1.wav";
-    config.afterConvertAction = 3;
-    MakeDriver(config);
-    driver->OnRunFinished();
-    EXPECT_EQ(host.sounds, std::vector<std::string>{"/x/hint1.wav"});
-    EXPECT_EQ(host.actions, std::vector<int>{3});
-    config.afterConvertAction = 17;
-    config.playSound = 0;
-    MakeDriver(config);
-    driver->OnRunFinished();
-    EXPECT_EQ(host.Messages(), std::vector<std::string>{"abnormal completed action"});
-}
-
 struct EnableCase {
     const char* name;
     std::vector<JobStatus> checked;
@@ -425,7 +419,8 @@ class EnableRulesTest : public EncodingDriverTest,
                         public ::testing::WithParamInterface<EnableCase> {};
 
 TEST_P(EnableRulesTest, FollowTheStatusesOfTheCheckedRows) {
-    for (JobStatus status : GetParam().checked) Add("row.wav", status);
+    for (JobStatus status : GetParam().checked)
+        Add("row.wav", status);
     Add("unchecked.wav", JobStatus::Running);
     list.SetChecked(list.GetRowCount() - 1, false);
     EXPECT_EQ(driver->CanEncodeChecked(), GetParam().encode);
@@ -442,7 +437,8 @@ INSTANTIATE_TEST_SUITE_P(
                       EnableCase{"Waiting", {S::Idle, S::Waiting}, false, true, true},
                       EnableCase{"Pending", {S::Pending}, false, true, true},
                       EnableCase{"Paused", {S::Paused, S::Aborted}, true, false, true},
-                      EnableCase{"Suspended", {S::AbortedSuspended, S::UnknownFile}, true, false, false}),
+                      EnableCase{
+                          "Suspended", {S::AbortedSuspended, S::UnknownFile}, true, false, false}),
     [](const auto& info) { return std::string(info.param.name); });
 
 }  // namespace

@@ -27,10 +27,18 @@ inline char ProcessState(int pid) {
 // Signals arrive a moment after they are sent; the bound only keeps a broken run finite.
 inline bool WaitForProcessState(int pid, char state) {
     for (int i = 0; i < 2000; ++i) {
-        if (ProcessState(pid) == state) return true;
+        if (ProcessState(pid) == state)
+            return true;
         ::usleep(5000);
     }
     return false;
+}
+
+inline int CountThreads() {
+    int count = 0;
+    for ([[maybe_unused]] auto& entry : std::filesystem::directory_iterator("/proc/self/task"))
+        ++count;
+    return count;
 }
 
 inline int CountOpenFds() {

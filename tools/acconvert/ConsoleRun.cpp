@@ -17,12 +17,17 @@ bool IsEnded(JobStatus s) {
 
 const char* StatusWord(JobStatus s) {
     switch (s) {
-    case JobStatus::Completed: return "done";
-    case JobStatus::Failed: return "FAILED";
-    case JobStatus::Aborted:
-    case JobStatus::AbortedSuspended: return "stopped";
-    case JobStatus::UnknownFile: return "unknown file";
-    default: return "";
+        case JobStatus::Completed:
+            return "done";
+        case JobStatus::Failed:
+            return "FAILED";
+        case JobStatus::Aborted:
+        case JobStatus::AbortedSuspended:
+            return "stopped";
+        case JobStatus::UnknownFile:
+            return "unknown file";
+        default:
+            return "";
     }
 }
 
@@ -82,21 +87,26 @@ void ConsoleRun::ShowMessage(const std::string& text, bool) {
     std::fprintf(stderr, "\nacconvert: %s\n", text.c_str());
 }
 
-void ConsoleRun::PostRunFinished() { RefreshRow(-1); }
+void ConsoleRun::PostRunFinished() {
+    RefreshRow(-1);
+}
 
 bool ConsoleRun::AllEnded() {
     for (int row = 0; row < GetRowCount(); ++row)
-        if (!IsEnded(GetItem(row)->Status())) return false;
+        if (!IsEnded(GetItem(row)->Status()))
+            return false;
     return true;
 }
 
-void ConsoleRun::ReportEnded(int row, JobStatus status) {
+void ConsoleRun::ReportEnded(int row, JobStatus status, int overall) {
     MediaItem* item = GetItem(row);
-    if (m_drawBar) std::fputs("\r\033[K", m_out);
+    if (m_drawBar)
+        std::fputs("\r\033[K", m_out);
     std::fprintf(m_out, "[%d/%d] %s: %s", row + 1, GetRowCount(), StatusWord(status),
                  item->sourcePath.c_str());
-    if (status == JobStatus::Completed) std::fprintf(m_out, " -> %s", item->outputPath.c_str());
-    std::fputc('\n', m_out);
+    if (status == JobStatus::Completed)
+        std::fprintf(m_out, " -> %s", item->outputPath.c_str());
+    std::fprintf(m_out, " (all %d%%)\n", overall);
     if (status == JobStatus::Failed) {
         if (CEncodeProcess* child = item->process.load())
             for (const auto& line : child->ErrorLines())
@@ -105,20 +115,23 @@ void ConsoleRun::ReportEnded(int row, JobStatus status) {
 }
 
 void ConsoleRun::Draw(EncodingDriver& driver, bool final) {
+    double total = driver.GetRunTotalSeconds();
+    int overall = total > 0 ? static_cast<int>(driver.GetRunDoneSeconds() / total * 100) : 0;
+    overall = std::clamp(overall, 0, 100);
     for (int row = 0; row < GetRowCount(); ++row) {
         MediaItem* item = GetItem(row);
         JobStatus status = item->Status();
         JobStatus& reported = m_reported[row];
-        if (status == reported) continue;
+        if (status == reported)
+            continue;
         if (status == JobStatus::Running && !m_drawBar)
             std::fprintf(m_out, "[%d/%d] converting: %s\n", row + 1, GetRowCount(),
                          item->sourcePath.c_str());
-        if (IsEnded(status) && status != JobStatus::Idle) ReportEnded(row, status);
+        if (IsEnded(status) && status != JobStatus::Idle)
+            ReportEnded(row, status, overall);
         reported = status;
     }
     if (m_drawBar && !final) {
-        double total = driver.GetRunTotalSeconds();
-        int overall = total > 0 ? static_cast<int>(driver.GetRunDoneSeconds() / total * 100) : 0;
         std::string current;
         int percent = 0;
         for (int row = 0; row < GetRowCount(); ++row) {
@@ -129,9 +142,10 @@ void ConsoleRun::Draw(EncodingDriver& driver, bool final) {
                 break;
             }
         }
-        if (current.size() > 28) current = current.substr(0, 25) + "...";
+        if (current.size() > 28)
+            current = current.substr(0, 25) + "...";
         std::fprintf(m_out, "\r\033[K%-28s %3d%% [%s] all %3d%%", current.c_str(), percent,
-                     Bar(percent).c_str(), std::clamp(overall, 0, 100));
+                     Bar(percent).c_str(), overall);
     }
     std::fflush(m_out);
 }
@@ -141,8 +155,8 @@ int ConsoleRun::Run(DriverConfig config, OutputNamer namer, CommandBuilder build
     EncodingDriver driver(*this, *this, std::move(config), std::move(namer), std::move(builder));
     m_reported.assign(GetRowCount(), JobStatus::Idle);
     for (int row = 0; row < GetRowCount(); ++row)
-        m_reported[row] = GetItem(row)->Status() == JobStatus::UnknownFile ? JobStatus::Idle
-                                                                           : JobStatus::Waiting;
+        m_reported[row] =
+            GetItem(row)->Status() == JobStatus::UnknownFile ? JobStatus::Idle : JobStatus::Waiting;
     driver.EncodeChecked();
     driver.Start();
     bool stopped = false;
@@ -162,9 +176,11 @@ int ConsoleRun::Run(DriverConfig config, OutputNamer namer, CommandBuilder build
     driver.Stop();
     // Exits that are still under way reach the driver; wait for them before it goes.
     for (int row = 0; row < GetRowCount(); ++row)
-        if (CEncodeProcess* child = GetItem(row)->process.load()) child->WaitForExit();
+        if (CEncodeProcess* child = GetItem(row)->process.load())
+            child->WaitForExit();
     Draw(driver, true);
-    if (m_drawBar) std::fputs("\r\033[K", m_out);
+    if (m_drawBar)
+        std::fputs("\r\033[K", m_out);
 
     int completed = 0;
     for (int row = 0; row < GetRowCount(); ++row)
@@ -172,7 +188,8 @@ int ConsoleRun::Run(DriverConfig config, OutputNamer namer, CommandBuilder build
     std::fprintf(m_out, "%d of %d converted%s\n", completed, GetRowCount(),
                  stopped ? " (stopped)" : "");
     std::fflush(m_out);
-    if (stopped) return 130;
+    if (stopped)
+        return 130;
     return completed == GetRowCount() ? 0 : 1;
 }
 

@@ -51,7 +51,7 @@ public:
 private:
     bool AllEnded();
     void Draw(EncodingDriver& driver, bool final);
-    void ReportEnded(int row, JobStatus status);
+    void ReportEnded(int row, JobStatus status, int overall);
 
     const std::string m_outputDirectory;
     const bool m_drawBar;

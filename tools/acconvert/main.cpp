@@ -36,7 +36,9 @@ using namespace ac;
 
 std::atomic<int> g_stopRequested{0};
 
-extern "C" void OnStopSignal(int) { g_stopRequested = 1; }
+extern "C" void OnStopSignal(int) {
+    g_stopRequested = 1;
+}
 
 struct Options {
     std::string profile = "mp3";
@@ -55,7 +57,8 @@ bool ParseArguments(int argc, char** argv, Options& options) {
         auto value = [&]() -> const char* { return i + 1 < argc ? argv[++i] : nullptr; };
         if (word == "--profile" || word == "--out" || word == "--jobs") {
             const char* text = value();
-            if (!text) return false;
+            if (!text)
+                return false;
             if (word == "--profile")
                 options.profile = text;
             else if (word == "--out")
@@ -65,7 +68,8 @@ bool ParseArguments(int argc, char** argv, Options& options) {
         } else if (word == "--help" || word == "-h") {
             return false;
         } else if (word == "--") {
-            for (++i; i < argc; ++i) options.files.emplace_back(argv[i]);
+            for (++i; i < argc; ++i)
+                options.files.emplace_back(argv[i]);
         } else if (word.starts_with("--")) {
             return false;
         } else {
@@ -75,16 +79,24 @@ bool ParseArguments(int argc, char** argv, Options& options) {
     return !options.files.empty();
 }
 
-// A row's parameter set, seen by the engine through the little it needs.
+// A row's parameter set, seen by the engine through the little it needs. Reading the cut of a
+// set rebuilds its command line, so the progress display on the main thread would write the set
+// while the driver builds the row's command from it; nothing edits the set during a terminal
+// run, so the cut is read once, before any thread starts, and the set is the driver's alone.
 class ProfileParameters : public JobParameters {
 public:
-    explicit ProfileParameters(std::unique_ptr<ParameterSet> set) : m_set(std::move(set)) {}
-    std::int64_t GetDuration() const override { return m_set->GetDuration(); }
-    std::int64_t GetStartTime() const override { return m_set->GetStartTime(); }
+    explicit ProfileParameters(std::unique_ptr<ParameterSet> set)
+        : m_set(std::move(set)),
+          m_duration(m_set->GetDuration()),
+          m_startTime(m_set->GetStartTime()) {}
+    std::int64_t GetDuration() const override { return m_duration; }
+    std::int64_t GetStartTime() const override { return m_startTime; }
     ParameterSet& Set() { return *m_set; }
 
 private:
     std::unique_ptr<ParameterSet> m_set;
+    const std::int64_t m_duration;
+    const std::int64_t m_startTime;
 };
 
 ParameterSet& SetOf(MediaItem& item) {
@@ -104,23 +116,27 @@ class LoosePackage {
 public:
     ~LoosePackage() {
         std::error_code ignored;
-        if (!m_folder.empty()) fs::remove_all(m_folder, ignored);
+        if (!m_folder.empty())
+            fs::remove_all(m_folder, ignored);
     }
     std::string Wrap(const std::string& file) {
         std::string pattern = (fs::temp_directory_path() / "acconvert-XXXXXX").string();
-        if (!::mkdtemp(pattern.data())) return {};
+        if (!::mkdtemp(pattern.data()))
+            return {};
         m_folder = pattern;
         std::ifstream in(file, std::ios::binary);
         std::string text((std::istreambuf_iterator<char>(in)), {});
         // The package's ini reader splits at CR LF, the line end profiles have always had.
         if (text.find("\r\n") == std::string::npos) {
             std::string crlf;
-            for (char c : text) c == '\n' ? crlf += "\r\n" : crlf += c;
+            for (char c : text)
+                c == '\n' ? crlf += "\r\n" : crlf += c;
             text.swap(crlf);
         }
         PackageWriter writer;
         std::string package = m_folder + "/cli.pkg";
-        if (!writer.Create() || !writer.Put("cli.pf", text) || !writer.Commit(package)) return {};
+        if (!writer.Create() || !writer.Put("cli.pf", text) || !writer.Commit(package))
+            return {};
         return package + "\\cli.pf";
     }
 
@@ -131,15 +147,19 @@ private:
 // A file on disk, else a system profile, else a user profile, by file name or shown name.
 std::unique_ptr<ParameterSet> FindProfile(const std::string& wanted, const std::string& base,
                                           LoosePackage& loose) {
-    if (fs::is_regular_file(wanted)) return LoadProfile(loose.Wrap(wanted));
+    if (fs::is_regular_file(wanted))
+        return LoadProfile(loose.Wrap(wanted));
     for (const char* folder : {"\\profile\\", "\\profile\\user\\"}) {
         std::string direct = base + folder + wanted + ".pf";
         if (ResourceExists(direct))
-            if (auto profile = LoadProfile(direct)) return profile;
+            if (auto profile = LoadProfile(direct))
+                return profile;
         ImPackageFinder finder;
-        for (bool more = finder.FindFile(base + folder + "*.pf"); more; more = finder.FindNextFile()) {
+        for (bool more = finder.FindFile(base + folder + "*.pf"); more;
+             more = finder.FindNextFile()) {
             auto profile = LoadProfile(finder.GetFilePath());
-            if (profile && profile->GetName() == wanted) return profile;
+            if (profile && profile->GetName() == wanted)
+                return profile;
         }
     }
     return nullptr;
@@ -152,7 +172,8 @@ std::unique_ptr<MediaItem> MakeRow(const std::string& sourcePath, const std::str
     item->sourcePath = sourcePath;
     bool probed = ProbeFile(sourcePath, item->info) == 1;
     auto set = profile.Clone();
-    if (probed) ApplyTags(*set, &item->info);
+    if (probed)
+        ApplyTags(*set, &item->info);
     set->SetValue("outfilename", name);
     item->parameters = std::make_unique<ProfileParameters>(std::move(set));
     item->SetStatus(probed ? JobStatus::Idle : JobStatus::UnknownFile);
@@ -162,7 +183,8 @@ std::unique_ptr<MediaItem> MakeRow(const std::string& sourcePath, const std::str
 // Cue sheets stand for their tracks, as in the list: one row per "SHEET|N".
 void AddSource(console::ConsoleRun& run, const std::string& path, const ParameterSet& profile) {
     std::string extension = fs::path(path).extension().string();
-    for (auto& c : extension) c = static_cast<char>(std::tolower(static_cast<unsigned char>(c)));
+    for (auto& c : extension)
+        c = static_cast<char>(std::tolower(static_cast<unsigned char>(c)));
     if (extension != ".cue") {
         run.AddRow(MakeRow(path, fs::path(path).stem().string(), profile));
         return;
@@ -186,10 +208,12 @@ void AddSource(console::ConsoleRun& run, const std::string& path, const Paramete
 }
 
 std::string FindTool() {
-    if (const char* forced = std::getenv("AC_CTT_PATH"); forced && *forced) return forced;
+    if (const char* forced = std::getenv("AC_CTT_PATH"); forced && *forced)
+        return forced;
     std::string here = platform::ExecutableDirectory();
     for (std::string candidate : {here + "/ctt", here + "/../lib/audio-converter/ctt"})
-        if (::access(candidate.c_str(), X_OK) == 0) return fs::weakly_canonical(candidate).string();
+        if (::access(candidate.c_str(), X_OK) == 0)
+            return fs::weakly_canonical(candidate).string();
     return here + "/ctt";
 }
 
@@ -209,8 +233,10 @@ int main(int argc, char** argv) {
         std::fprintf(stderr, "acconvert: no profile named %s\n", options.profile.c_str());
         return 2;
     }
+    // The tool runs in the program's folder, so every path it gets must stand on its own.
     std::string outputDirectory =
         options.outputDirectory.empty() ? config.GetString("OutputDir") : options.outputDirectory;
+    outputDirectory = fs::absolute(outputDirectory).lexically_normal().string();
 
     DriverConfig driverConfig;
     driverConfig.maxProcesses = config.GetInt("max_processes");
@@ -233,7 +259,8 @@ int main(int argc, char** argv) {
     std::signal(SIGPIPE, SIG_IGN);
 
     console::ConsoleRun run(outputDirectory, ::isatty(STDOUT_FILENO) == 1, stdout);
-    for (const auto& file : options.files) AddSource(run, file, *profile);
+    for (const auto& file : options.files)
+        AddSource(run, fs::absolute(file).lexically_normal().string(), *profile);
 
     OutputNamer namer = [naming](int row, MediaItem& item, const std::string& directory,
                                  const std::string& lastOutput) {
