@@ -14,6 +14,7 @@
 #include <wx/graphics.h>
 #include <wx/msgdlg.h>
 #include <wx/taskbar.h>
+#include <wx/time.h>
 #include <wx/utils.h>
 
 #include <sstream>
@@ -85,6 +86,12 @@ CAudioEncDlg::CAudioEncDlg()
     });
     Bind(wxEVT_CLOSE_WINDOW, &CAudioEncDlg::OnClose, this);
     Bind(wxEVT_TIMER, &CAudioEncDlg::OnTimer, this);
+    Bind(wxEVT_PAINT, [this](wxPaintEvent& event) {
+        if (m_firstPaintMs == 0) {
+            m_firstPaintMs = wxGetUTCTimeMillis().GetValue();
+        }
+        event.Skip();
+    });
     Bind(wxEVT_ICONIZE, [this](wxIconizeEvent& event) {
         if (!event.IsIconized()) {
             RecalcLayout();
@@ -446,6 +453,8 @@ std::string CAudioEncDlg::DescribeState() const {
     out << "skin=" << g_Skin.GetSkinName() << "\n";
     out << "language=" << g_Language.GetLanguageName() << "\n";
     out << "corners=" << (HasFlag(wxFRAME_SHAPED) ? 1 : 0) << "\n";
+    out << "firstpaint_ms=" << m_firstPaintMs << "\n";
+    out << "resize_ms=" << m_lastBench << "\n";
     return out.str();
 }
 
@@ -500,6 +509,19 @@ void CAudioEncDlg::RunScriptCommand(const std::string& line) {
                 }
             }
         }
+    } else if (verb == "benchresize") {
+        // Repaint time after a resize, for bench/skin_bench.sh: each step resizes and paints.
+        int steps = 50;
+        in >> steps;
+        const wxRect start = GetRect();
+        const wxLongLong begin = wxGetUTCTimeUSec();
+        for (int i = 0; i < steps; ++i) {
+            SetSize(start.width + (i % 10) * 12, start.height + (i % 7) * 9);
+            Update();
+        }
+        const double perStep = (wxGetUTCTimeUSec() - begin).ToDouble() / 1000.0 / steps;
+        SetSize(start);
+        m_lastBench = perStep;
     } else if (verb == "close") {
         Close();
     }

@@ -376,4 +376,33 @@ std::pair<int, int> PlacePopupBeside(int parentX, int parentY, int parentW, int 
     return {x, y};
 }
 
+SkinRect ListCheckBox(const SkinRect& cell, bool hasText) {
+    constexpr int kSide = 13;
+    const int x = hasText ? cell.x + 9 : cell.x + (cell.w - kSide) / 2;
+    return {x, cell.y + (cell.h - kSide) / 2, kSide, kSide};
+}
+
+std::vector<SkinRect> ListTickStrokes(const SkinRect& box) {
+    std::vector<SkinRect> strokes;
+    int x = box.x + 10;
+    int y = box.y + 4;
+    for (int i = 0; i < 7; ++i) {
+        strokes.push_back({x, y, 1, 3});
+        --x;
+        y += i < 3 ? 1 : -1;
+    }
+    return strokes;
+}
+
+int ListProgressWidth(int cellWidth, int percent) {
+    if (percent <= 0 || cellWidth <= 0) {
+        return 0;
+    }
+    return cellWidth * std::min(percent, 100) / 100;
+}
+
+int NextHeaderCheckState(int state, int rowCount) {
+    return state == 1 && rowCount > 0 ? 2 : 1;
+}
+
 }  // namespace ac

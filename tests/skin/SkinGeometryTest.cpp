@@ -301,3 +301,31 @@ TEST(MenuTest, PopupsFlipAboveTheBarOrToTheLeftNearScreenEdges) {
 
 }  // namespace
 }  // namespace ac
+
+namespace ac {
+namespace {
+
+TEST(ListCellTest, CheckBoxSitsNinePixelsInOrCentredWithoutText) {
+    EXPECT_EQ(ListCheckBox({100, 20, 80, 21}, true), (SkinRect{109, 24, 13, 13}));
+    EXPECT_EQ(ListCheckBox({100, 20, 80, 21}, false), (SkinRect{133, 24, 13, 13}));
+}
+
+TEST(ListCellTest, TickGoesDownFourStrokesThenUpThree) {
+    const auto strokes = ListTickStrokes({0, 0, 13, 13});
+    ASSERT_EQ(strokes.size(), 7u);
+    EXPECT_EQ(strokes[0], (SkinRect{10, 4, 1, 3}));
+    EXPECT_EQ(strokes[3], (SkinRect{7, 7, 1, 3}));
+    EXPECT_EQ(strokes[6], (SkinRect{4, 4, 1, 3}));
+}
+
+TEST(ListCellTest, ProgressAndHeaderStates) {
+    EXPECT_EQ(ListProgressWidth(200, 0), 0);
+    EXPECT_EQ(ListProgressWidth(200, 50), 100);
+    EXPECT_EQ(ListProgressWidth(200, 250), 200);
+    EXPECT_EQ(NextHeaderCheckState(1, 3), 2);
+    EXPECT_EQ(NextHeaderCheckState(1, 0), 1) << "an empty list keeps its header unchecked";
+    EXPECT_EQ(NextHeaderCheckState(2, 3), 1);
+}
+
+}  // namespace
+}  // namespace ac
