@@ -11,7 +11,7 @@ packages=(
   libavformat-dev libavcodec-dev libswresample-dev libavutil-dev
   libcdio-dev libcdio-paranoia-dev libburn-dev libisofs-dev libsdl2-dev
   # tests and benchmarks
-  googletest libgtest-dev libbenchmark-dev xvfb xauth x11-utils imagemagick ffmpeg hyperfine
+  googletest libgtest-dev libbenchmark-dev xvfb xauth x11-utils imagemagick ffmpeg hyperfine time
 )
 
 sudo_cmd=()
