@@ -14,8 +14,8 @@ namespace {
 class BenchApp : public wxApp {
 public:
     bool OnInit() override {
-        auto* frame = new wxFrame(nullptr, wxID_ANY, "XListCtrl bench", wxPoint(0, 0),
-                                  wxSize(840, 634));
+        auto* frame =
+            new wxFrame(nullptr, wxID_ANY, "XListCtrl bench", wxPoint(0, 0), wxSize(840, 634));
         auto* list = new ac::XListCtrl(frame, wxID_ANY);
         list->InsertColumn(0, "File", 300, true);
         list->InsertColumn(1, "Duration", 90);
@@ -23,7 +23,8 @@ public:
         list->InsertColumn(3, "Status", 200);
         list->SetRowHeight(22);
         for (int i = 0; i < 10000; ++i) {
-            const int row = list->InsertItem(i, "Track " + std::to_string(i + 1) + " - a long title.flac");
+            const int row =
+                list->InsertItem(i, "Track " + std::to_string(i + 1) + " - a long title.flac");
             list->SetCheckbox(row, 0, i % 3 != 0);
             list->SetItemText(row, 1, std::to_string(i % 60) + ":" + std::to_string(10 + i % 50));
             list->SetProgress(row, 2);

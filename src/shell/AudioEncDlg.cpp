@@ -69,11 +69,10 @@ CAudioEncDlg::CAudioEncDlg()
       m_selectionTimer(this, kSelectionTimer) {
     m_defaultSize = wxSize(840, 634);
     m_minSize = wxSize(840, 634);
-    SetSettingsAccess(
-        [](const char* key) { return GetAppConfig().GetString(key); },
-        [](const char* key, const std::string& value) {
-            GetAppConfig().SetString(key, value.c_str());
-        });
+    SetSettingsAccess([](const char* key) { return GetAppConfig().GetString(key); },
+                      [](const char* key, const std::string& value) {
+                          GetAppConfig().SetString(key, value.c_str());
+                      });
     AppConfig& config = GetAppConfig();
     m_afterConvert = config.GetInt("afterconvert");
     Bind(wxEVT_MENU, &CAudioEncDlg::OnCommand, this);
@@ -221,8 +220,8 @@ void CAudioEncDlg::FillSkinMenu(wxMenu& popup) {
             continue;
         }
         wxMenuItem* item = popup.AppendCheckItem(id, wxString::FromUTF8(config.GetName()));
-        item->Check(wxString::FromUTF8(SkinNameOf(dir)).IsSameAs(
-            wxString::FromUTF8(g_Skin.GetSkinName()), false));
+        item->Check(wxString::FromUTF8(SkinNameOf(dir))
+                        .IsSameAs(wxString::FromUTF8(g_Skin.GetSkinName()), false));
         m_skinCommands[id++] = dir;
     }
 }
@@ -289,7 +288,8 @@ void CAudioEncDlg::RecalcLayout() {
     const wxRect column(rightX, content.y + gapHeight, rightW,
                         std::max(0, content.height - gapHeight - m_metrics.BottomMargin));
     for (Panel list : {MediaList, Rip, Creator}) {
-        LayoutRow(column, 1, 0, m_panels[list], {m_panels[list], m_panels[Output], m_panels[Status]});
+        LayoutRow(column, 1, 0, m_panels[list],
+                  {m_panels[list], m_panels[Output], m_panels[Status]});
     }
     const wxRect side(left, content.y + 4, sideWidth,
                       std::max(0, content.height - 4 - m_metrics.BottomMargin));
@@ -306,8 +306,9 @@ void CAudioEncDlg::OnTimer(wxTimerEvent& event) {
         return;
     }
     const int mode = GetWorkMode();
-    const std::string path =
-        GetAppConfig().GetString(mode == 2 ? "burntemp" : mode == 1 ? "OutputCDDir" : "OutputDir");
+    const std::string path = GetAppConfig().GetString(mode == 2   ? "burntemp"
+                                                      : mode == 1 ? "OutputCDDir"
+                                                                  : "OutputDir");
     wxLongLong freeBytes;
     if (!path.empty() && wxDirExists(wxString::FromUTF8(path)) &&
         wxGetDiskSpace(wxString::FromUTF8(path), nullptr, &freeBytes) &&
@@ -387,31 +388,31 @@ void CAudioEncDlg::OnCommand(wxCommandEvent& event) {
         return;
     }
     switch (id) {
-    case cmd::kExit:
-        Close();
-        return;
-    case cmd::kBackground:
-        ToTray();
-        return;
-    case cmd::kTrayOpen:
-        FromTray();
-        return;
-    case cmd::kTrayExit:
-        Close();
-        return;
-    case cmd::kSupport:
-        wxLaunchDefaultBrowser("https://velmorant.example/support");
-        return;
-    case cmd::kAbout: {
-        const ProductStrings& product = GetAppConfig().GetProductStrings();
-        wxMessageBox(wxString::FromUTF8(product.productFullName + " " AC_VERSION),
-                     wxString::FromUTF8(product.productName), wxOK | wxICON_INFORMATION, this);
-        return;
-    }
-    default:
-        // Commands of the list panels arrive here once those panels exist.
-        event.Skip();
-        return;
+        case cmd::kExit:
+            Close();
+            return;
+        case cmd::kBackground:
+            ToTray();
+            return;
+        case cmd::kTrayOpen:
+            FromTray();
+            return;
+        case cmd::kTrayExit:
+            Close();
+            return;
+        case cmd::kSupport:
+            wxLaunchDefaultBrowser("https://velmorant.example/support");
+            return;
+        case cmd::kAbout: {
+            const ProductStrings& product = GetAppConfig().GetProductStrings();
+            wxMessageBox(wxString::FromUTF8(product.productFullName + " " AC_VERSION),
+                         wxString::FromUTF8(product.productName), wxOK | wxICON_INFORMATION, this);
+            return;
+        }
+        default:
+            // Commands of the list panels arrive here once those panels exist.
+            event.Skip();
+            return;
     }
 }
 
@@ -421,8 +422,8 @@ std::string CAudioEncDlg::DescribeState() const {
     out << "title=" << GetTitle().utf8_string() << "\n";
     out << "rect=" << r.x << "," << r.y << "," << r.width << "," << r.height << "\n";
     out << "mode=" << GetWorkMode() << "\n";
-    static const char* const kNames[PanelCount] = {"MediaList", "CDCreatorPanel", "OutputPanel",
-                                                   "PlayerPanel", "CDRip", "SideBar",
+    static const char* const kNames[PanelCount] = {"MediaList",   "CDCreatorPanel", "OutputPanel",
+                                                   "PlayerPanel", "CDRip",          "SideBar",
                                                    "StatusBar"};
     out << "visible=";
     for (int i = 0; i < PanelCount; ++i) {
@@ -446,8 +447,8 @@ std::string CAudioEncDlg::DescribeState() const {
     }
     out << "tabs=";
     for (int i = 0; i < 3; ++i) {
-        out << m_check->Tab(i)->GetLabel().utf8_string() << (m_check->Tab(i)->IsEnabled() ? "+" : "-")
-            << "|";
+        out << m_check->Tab(i)->GetLabel().utf8_string()
+            << (m_check->Tab(i)->IsEnabled() ? "+" : "-") << "|";
     }
     out << "\n";
     out << "skin=" << g_Skin.GetSkinName() << "\n";

@@ -190,11 +190,12 @@ int XListCtrl::GetHeaderCheck(int column) const {
 }
 
 void XListCtrl::ToggleHeaderCheck(int column) {
-    if (column < 0 || column >= GetColumnCount() || m_columns[std::size_t(column)].headerCheck == 0) {
+    if (column < 0 || column >= GetColumnCount() ||
+        m_columns[std::size_t(column)].headerCheck == 0) {
         return;
     }
-    const int state = NextHeaderCheckState(m_columns[std::size_t(column)].headerCheck,
-                                           GetItemCount());
+    const int state =
+        NextHeaderCheckState(m_columns[std::size_t(column)].headerCheck, GetItemCount());
     m_columns[std::size_t(column)].headerCheck = state;
     wxCommandEvent notice(EVT_XLIST_HEADER_CHECK, GetId());
     notice.SetInt(column);
@@ -414,7 +415,7 @@ wxCoord XListBody::OnGetRowHeight(size_t /*row*/) const {
 
 void XListBody::DrawCell(wxDC& dc, const wxRect& rect, const XListCell& cell,
                          const XListCell& first, bool selected) const {
-    const wxColour text = !first.bEnabled ? m_list->m_disabledColour
+    const wxColour text = !first.bEnabled      ? m_list->m_disabledColour
                           : cell.crText.IsOk() ? cell.crText
                                                : m_list->m_textColour;
     wxColour background = cell.crBackground.IsOk() ? cell.crBackground : m_list->m_bgColour;
@@ -440,7 +441,8 @@ void XListBody::DrawCell(wxDC& dc, const wxRect& rect, const XListCell& cell,
             const wxString label = wxString::FromUTF8(ProgressText(cell));
             // Drawn twice, clipped at the bar's end, so the letters invert over the filled part.
             {
-                wxDCClipper clip(dc, wxRect(bar.GetRight() + 1, frame.y, frame.width, frame.height));
+                wxDCClipper clip(dc,
+                                 wxRect(bar.GetRight() + 1, frame.y, frame.width, frame.height));
                 dc.SetTextForeground(text);
                 dc.DrawLabel(label, frame, wxALIGN_CENTER);
             }
@@ -540,27 +542,28 @@ void XListBody::OnKey(wxKeyEvent& event) {
     const int count = m_list->GetItemCount();
     int row = m_list->GetCurSel();
     switch (event.GetKeyCode()) {
-    case WXK_DOWN:
-        row = std::min(count - 1, row + 1);
-        break;
-    case WXK_UP:
-        row = std::max(0, row - 1);
-        break;
-    case WXK_PAGEDOWN:
-        row = std::min(count - 1, row + static_cast<int>(GetVisibleRowsEnd() - GetVisibleRowsBegin()));
-        break;
-    case WXK_PAGEUP:
-        row = std::max(0, row - static_cast<int>(GetVisibleRowsEnd() - GetVisibleRowsBegin()));
-        break;
-    case WXK_HOME:
-        row = 0;
-        break;
-    case WXK_END:
-        row = count - 1;
-        break;
-    default:
-        event.Skip();
-        return;
+        case WXK_DOWN:
+            row = std::min(count - 1, row + 1);
+            break;
+        case WXK_UP:
+            row = std::max(0, row - 1);
+            break;
+        case WXK_PAGEDOWN:
+            row = std::min(count - 1,
+                           row + static_cast<int>(GetVisibleRowsEnd() - GetVisibleRowsBegin()));
+            break;
+        case WXK_PAGEUP:
+            row = std::max(0, row - static_cast<int>(GetVisibleRowsEnd() - GetVisibleRowsBegin()));
+            break;
+        case WXK_HOME:
+            row = 0;
+            break;
+        case WXK_END:
+            row = count - 1;
+            break;
+        default:
+            event.Skip();
+            return;
     }
     if (row >= 0) {
         m_list->SelectRow(row);

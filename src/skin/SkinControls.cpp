@@ -13,8 +13,8 @@ ImButton::ImButton(wxWindow* parent, int id, const wxString& text)
         colour = wxSystemSettings::GetColour(wxSYS_COLOUR_BTNTEXT);
     }
     Bind(wxEVT_PAINT, &ImButton::OnPaint, this);
-    for (auto type : {wxEVT_ENTER_WINDOW, wxEVT_LEAVE_WINDOW, wxEVT_MOTION, wxEVT_LEFT_DOWN,
-                      wxEVT_LEFT_UP}) {
+    for (auto type :
+         {wxEVT_ENTER_WINDOW, wxEVT_LEAVE_WINDOW, wxEVT_MOTION, wxEVT_LEFT_DOWN, wxEVT_LEFT_UP}) {
         Bind(type, &ImButton::OnMouse, this);
     }
     Bind(wxEVT_MOUSE_CAPTURE_LOST, [this](wxMouseCaptureLostEvent&) { m_bPushed = false; });

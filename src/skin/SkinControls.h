@@ -15,10 +15,16 @@ class ImButton : public wxWindow {
 public:
     ImButton(wxWindow* parent, int id, const wxString& text = {});
     void SetPicture(SkinPicture picture);
-    void SetTextShown(bool shown) { m_bText = shown; Refresh(false); }
+    void SetTextShown(bool shown) {
+        m_bText = shown;
+        Refresh(false);
+    }
     // Up, down, active (under the mouse), disabled.
     void SetTextColours(const wxColour colours[4]);
-    void SetTextOffset(const wxPoint& offset) { m_textOffset = offset; Refresh(false); }
+    void SetTextOffset(const wxPoint& offset) {
+        m_textOffset = offset;
+        Refresh(false);
+    }
     void SetLabel(const wxString& label) override;
     bool Enable(bool enable = true) override;
     // The cell height of the picture, 0 without one.

@@ -191,8 +191,8 @@ std::vector<CapacityRun> CapacityRuns(long long position, long long range, long 
     }
     const int filled =
         static_cast<int>(std::min<long long>(position, range) * width / range) + leftMargin;
-    const bool marks = maximum > 0 && nearMark > 0 && overMark > 0 && nearMark < maximum &&
-                       overMark < maximum;
+    const bool marks =
+        maximum > 0 && nearMark > 0 && overMark > 0 && nearMark < maximum && overMark < maximum;
     auto add = [&](int x0, int x1, CapacityFill fill) {
         x1 = std::min(x1, filled);
         if (x1 > x0) {
@@ -211,8 +211,7 @@ std::vector<CapacityRun> CapacityRuns(long long position, long long range, long 
     return runs;
 }
 
-std::vector<ScaleTick> CapacityScale(long long maximum, long long step, int width,
-                                     int leftMargin) {
+std::vector<ScaleTick> CapacityScale(long long maximum, long long step, int width, int leftMargin) {
     std::vector<ScaleTick> ticks;
     if (maximum <= 0 || step <= 0) {
         return ticks;
@@ -317,8 +316,7 @@ std::pair<std::string, char> SplitMnemonic(std::string_view text) {
     for (std::size_t i = 0; i < text.size(); ++i) {
         if (text[i] == '&') {
             if (i + 1 < text.size()) {
-                mnemonic = static_cast<char>(
-                    std::tolower(static_cast<unsigned char>(text[i + 1])));
+                mnemonic = static_cast<char>(std::tolower(static_cast<unsigned char>(text[i + 1])));
             }
             continue;
         }

@@ -35,7 +35,7 @@ struct SkinBlit {
 
 struct SplitPlan {
     std::vector<SkinBlit> blits;
-    SkinRect fill;      // the middle: one colour,
+    SkinRect fill;        // the middle: one colour,
     int fillSourceX = 0;  // taken from this source pixel
     int fillSourceY = 0;
 };

@@ -293,8 +293,7 @@ TEST(MenuTest, PopupsFlipAboveTheBarOrToTheLeftNearScreenEdges) {
     EXPECT_EQ(PlacePopupUnderBar(1200, 60, 150, 200, 26, 1280, 1024).first, 1130);
     EXPECT_EQ(PlacePopupUnderBar(-20, 60, 150, 200, 26, 1280, 1024).first, 0);
 
-    EXPECT_EQ(PlacePopupBeside(100, 100, 150, 30, 120, 200, 1280, 1024),
-              std::make_pair(250, 130));
+    EXPECT_EQ(PlacePopupBeside(100, 100, 150, 30, 120, 200, 1280, 1024), std::make_pair(250, 130));
     EXPECT_EQ(PlacePopupBeside(1100, 100, 150, 30, 120, 200, 1280, 1024).first, 980);
     EXPECT_EQ(PlacePopupBeside(100, 900, 150, 30, 120, 200, 1280, 1024).second, 774);
 }
