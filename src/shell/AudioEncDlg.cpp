@@ -5,6 +5,7 @@
 #include "shell/AppConfig.h"
 #include "shell/Check.h"
 #include "shell/MenuTables.h"
+#include "skin/ChooseSkinDlg.h"
 #include "skin/SkinBars.h"
 #include "skin/SkinMenu.h"
 #include "skin/WxTranslate.h"
@@ -171,6 +172,17 @@ void CAudioEncDlg::CreatePanels() {
     m_panels[Output] = new ImSkinPanel(this, 1005, "OutputPanel");
     m_panels[Player] = new ImSkinPanel(this, 1008, "PlayerPanel");
     m_panels[Rip] = new ImSkinPanel(this, 1063, "CDRip");
+    // The lists' own context menus; their commands travel to this window like the bar's.
+    const std::pair<Panel, int> contextMenus[] = {{MediaList, kMediaListContextMenu},
+                                                  {Rip, kRipListContextMenu},
+                                                  {Creator, kBurnListContextMenu}};
+    for (const auto& [panel, menuId] : contextMenus) {
+        m_panels[panel]->Bind(wxEVT_CONTEXT_MENU, [this, menuId = menuId](wxContextMenuEvent&) {
+            std::unique_ptr<wxMenu> menu = BuildContextMenu(menuId);
+            TranslatePopupMenu(*menu, menuId);
+            PopupMenu(menu.get());
+        });
+    }
     m_panels[Output]->SetSize(-1, kOutputPanelHeight + 10);
     m_panels[Status]->SetSize(-1, kStatusPanelHeight);
     m_panels[Player]->SetSize(-1, kPlayerHeight);
@@ -400,7 +412,13 @@ void CAudioEncDlg::OnCommand(wxCommandEvent& event) {
         case cmd::kTrayExit:
             Close();
             return;
-        case cmd::kSupport:
+        case cmd::kChooseSkinDialog: {
+        ImChooseSkinDlg dialog(this);
+        dialog.ShowModal();
+        LoadModeMenu(GetWorkMode());
+        return;
+    }
+    case cmd::kSupport:
             wxLaunchDefaultBrowser("https://velmorant.example/support");
             return;
         case cmd::kAbout: {
