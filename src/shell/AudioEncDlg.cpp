@@ -413,12 +413,12 @@ void CAudioEncDlg::OnCommand(wxCommandEvent& event) {
             Close();
             return;
         case cmd::kChooseSkinDialog: {
-        ImChooseSkinDlg dialog(this);
-        dialog.ShowModal();
-        LoadModeMenu(GetWorkMode());
-        return;
-    }
-    case cmd::kSupport:
+            ImChooseSkinDlg dialog(this);
+            dialog.ShowModal();
+            LoadModeMenu(GetWorkMode());
+            return;
+        }
+        case cmd::kSupport:
             wxLaunchDefaultBrowser("https://velmorant.example/support");
             return;
         case cmd::kAbout: {

@@ -72,19 +72,24 @@ ImChooseSkinDlg::ImChooseSkinDlg(wxWindow* parent)
         if (!config->Load(g_Skin.GetSkinAt(i))) {
             continue;
         }
-        const long item = m_list->InsertItem(m_list->GetItemCount(),
-                                             wxString::FromUTF8(config->GetName()));
+        const long item =
+            m_list->InsertItem(m_list->GetItemCount(), wxString::FromUTF8(config->GetName()));
         m_list->SetItemData(item, static_cast<long>(m_skins.size()));
         m_skins.push_back(std::move(config));
     }
     m_apply->Disable();
     m_list->Bind(wxEVT_LIST_ITEM_SELECTED, &ImChooseSkinDlg::OnSelected, this);
-    Bind(wxEVT_BUTTON, [this](wxCommandEvent&) { Apply(); }, kApplyId);
-    Bind(wxEVT_BUTTON, [this](wxCommandEvent&) {
-        Apply();
-        EndModal(wxID_OK);
-    }, kOkId);
-    Bind(wxEVT_BUTTON, [this](wxCommandEvent&) { EndModal(wxID_CANCEL); }, kCancelId);
+    Bind(
+        wxEVT_BUTTON, [this](wxCommandEvent&) { Apply(); }, kApplyId);
+    Bind(
+        wxEVT_BUTTON,
+        [this](wxCommandEvent&) {
+            Apply();
+            EndModal(wxID_OK);
+        },
+        kOkId);
+    Bind(
+        wxEVT_BUTTON, [this](wxCommandEvent&) { EndModal(wxID_CANCEL); }, kCancelId);
     for (int i = 0; i < m_list->GetItemCount(); ++i) {
         if (SameDir(m_skins[std::size_t(m_list->GetItemData(i))]->GetDir(), m_currentDir)) {
             m_list->SetItemState(i, wxLIST_STATE_SELECTED | wxLIST_STATE_FOCUSED,

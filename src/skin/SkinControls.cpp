@@ -75,7 +75,12 @@ void ImButton::OnPaint(wxPaintEvent& /*event*/) {
         if (m_textOffset == wxPoint(0, 0)) {
             textRect = wxRect(size);
         }
-        dc.DrawLabel(GetLabel(), textRect, wxALIGN_CENTER);
+        // A translation longer than the face starts at the text position instead of spilling
+        // over the picture's left part.
+        const bool fits = dc.GetTextExtent(GetLabel()).x <= textRect.width;
+        wxDCClipper clip(dc, textRect);
+        dc.DrawLabel(GetLabel(), textRect,
+                     fits ? wxALIGN_CENTER : (wxALIGN_LEFT | wxALIGN_CENTER_VERTICAL));
     }
 }
 
@@ -136,8 +141,7 @@ void ImSlider::SetTotal(int seconds) {
     Refresh(false);
 }
 
-void ImSlider::SetPictures(SkinPicture fore, SkinPicture gone, SkinPicture block,
-                           SkinPicture bg) {
+void ImSlider::SetPictures(SkinPicture fore, SkinPicture gone, SkinPicture block, SkinPicture bg) {
     m_fore = std::move(fore);
     m_gone = std::move(gone);
     m_block = std::move(block);
