@@ -155,9 +155,13 @@ void ImSlider::SetColours(const wxColour& background, const wxColour& text) {
     Refresh(false);
 }
 
+void ImSlider::DrawTrack(wxDC& dc, const SkinPicture& picture, int y, int fromX, int toX) const {
+    DrawSliderTrack(dc, picture, y, fromX, toX);
+}
+
 // A track picture: its first columns at the left end, its last at the right end, and columns 2
 // and 3 repeated between them.
-void ImSlider::DrawTrack(wxDC& dc, const SkinPicture& picture, int y, int fromX, int toX) const {
+void DrawSliderTrack(wxDC& dc, const SkinPicture& picture, int y, int fromX, int toX) {
     const int pw = picture.Width();
     const int ph = picture.Height();
     if (pw < 4 || toX <= fromX) {

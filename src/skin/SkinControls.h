@@ -43,6 +43,8 @@ private:
     wxPoint m_textOffset{0, 0};
 };
 
+void DrawSliderTrack(wxDC& dc, const SkinPicture& picture, int y, int fromX, int toX);
+
 // The preview slider: track, played part and thumb from four pictures. A click or drag moves
 // the thumb and sends wxEVT_SLIDER.
 class ImSlider : public wxWindow {
@@ -53,7 +55,10 @@ public:
     int GetPos() const { return m_pos; }
     void SetTotal(int seconds);
     // "Video Converter" draws the bands and the time text; empty draws the bare slider.
-    void SetMode(const wxString& mode) { m_mode = mode; Refresh(false); }
+    void SetMode(const wxString& mode) {
+        m_mode = mode;
+        Refresh(false);
+    }
     void SetPictures(SkinPicture fore, SkinPicture gone, SkinPicture block, SkinPicture bg);
     void SetColours(const wxColour& background, const wxColour& text);
 
@@ -76,12 +81,17 @@ private:
 class ImCapacityBar : public wxWindow {
 public:
     ImCapacityBar(wxWindow* parent, int id);
-    void SetRange(long long range) { m_range = range; Refresh(false); }
-    void SetPos(long long position) { m_pos = position; Refresh(false); }
+    void SetRange(long long range) {
+        m_range = range;
+        Refresh(false);
+    }
+    void SetPos(long long position) {
+        m_pos = position;
+        Refresh(false);
+    }
     void SetMarks(long long nearOverflow, long long overflow, long long maximum);
     void SetScale(long long step, const wxString& unit);
-    void SetPictures(SkinPicture fore, SkinPicture nearFore, SkinPicture overFore,
-                     SkinPicture bg);
+    void SetPictures(SkinPicture fore, SkinPicture nearFore, SkinPicture overFore, SkinPicture bg);
     void SetColours(const wxColour& tickPen, const wxColour& tickText);
 
 private:
