@@ -166,14 +166,23 @@ def write_bmp(path, c, bg=(255, 255, 255, 255)):
 def write_gif(path, c, bg):
     """A GIF with a 6x6x6 colour cube, LZW kept at 9-bit codes by frequent clear codes."""
     c = flatten(c, bg)
+    # The most frequent colours make the palette; a preview has few besides its edges.
+    counts = {}
+    for p in c.px:
+        key = tuple(int(round(v)) for v in p[:3])
+        counts[key] = counts.get(key, 0) + 1
+    colours = sorted(counts, key=lambda k: -counts[k])[:256]
     palette = bytearray()
-    for r in range(6):
-        for g in range(6):
-            for b in range(6):
-                palette += bytes((r * 51, g * 51, b * 51))
+    for col in colours:
+        palette += bytes(col)
     palette += b'\0' * (256 * 3 - len(palette))
-    idx = [int(round(p[0] / 51)) * 36 + int(round(p[1] / 51)) * 6 + int(round(p[2] / 51))
-           for p in c.px]
+    nearest = {}
+    def index_of(key):
+        if key not in nearest:
+            nearest[key] = min(range(len(colours)), key=lambda i: sum(
+                (colours[i][j] - key[j]) ** 2 for j in range(3)))
+        return nearest[key]
+    idx = [index_of(tuple(int(round(v)) for v in p[:3])) for p in c.px]
     codes = []
     for i, v in enumerate(idx):
         if i % 250 == 0:
@@ -224,7 +233,7 @@ THEMES = {
 
 CAPTION_H = 32
 MENU_H = 26
-TAB_W, TAB_H = 112, 30
+TAB_W, TAB_H = 124, 30
 GAP_H = 36
 
 
@@ -575,7 +584,7 @@ def write_ini(path, t):
         'Caption': ['BgHSplitter=16', 'BgVSplitter=40', 'TextOffset=36', 'TextVOffset=0',
                     'IconOffset=12', 'IconVOffset=0', 'NoText=0', 'SysMenuIndent=0',
                     'SysMenuTopIndent=0'] + fontblock(95, 600) + [f'TextColor={R("cap_text")}'],
-        'Menu': ['ItemLeft=6', 'ItemWidth=64', 'ItemHeight=22', 'ItemCount=5', 'ItemSpacing=2',
+        'Menu': ['ItemLeft=6', 'ItemWidth=80', 'ItemHeight=22', 'ItemCount=5', 'ItemSpacing=2',
                  'MarginTop=2'] + fontblock() + [
                  'BgVSplitter=20', f'TextColor={R("menu_text")}', 'IsUseDefindColor=0',
                  f'MainMenuBorderColor={R("border")}', f'ItemBgColor={R("hover")}',

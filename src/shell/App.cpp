@@ -42,9 +42,24 @@ void ChooseLanguage(ac::AppConfig& config) {
     ac::g_Language.Init(config.GetBaseDirectory(), name);
 }
 
+// The program's command ids come from its menu resources and run up to 33204, beyond the
+// 0x7FFF that wx's menus check for; they work all the same, so only that check is silenced.
+wxAssertHandler_t s_defaultAssertHandler = nullptr;
+
+void IgnoreMenuIdAssert(const wxString& file, int line, const wxString& function,
+                        const wxString& condition, const wxString& message) {
+    if (message == "invalid itemid value") {
+        return;
+    }
+    if (s_defaultAssertHandler != nullptr) {
+        s_defaultAssertHandler(file, line, function, condition, message);
+    }
+}
+
 class CAudioEncApp : public wxApp {
 public:
     bool OnInit() override {
+        s_defaultAssertHandler = wxSetAssertHandler(IgnoreMenuIdAssert);
         ac::AppConfig& config = ac::GetAppConfig();
         const ac::ProductStrings& product = config.GetProductStrings();
         SetAppDisplayName(wxString::FromUTF8(product.productName));

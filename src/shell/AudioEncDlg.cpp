@@ -5,6 +5,7 @@
 #include "shell/AppConfig.h"
 #include "shell/Check.h"
 #include "shell/MenuTables.h"
+#include "skin/ChooseSkinDlg.h"
 #include "skin/SkinBars.h"
 #include "skin/SkinMenu.h"
 #include "skin/WxTranslate.h"
@@ -14,6 +15,7 @@
 #include <wx/graphics.h>
 #include <wx/msgdlg.h>
 #include <wx/taskbar.h>
+#include <wx/time.h>
 #include <wx/utils.h>
 
 #include <sstream>
@@ -68,11 +70,10 @@ CAudioEncDlg::CAudioEncDlg()
       m_selectionTimer(this, kSelectionTimer) {
     m_defaultSize = wxSize(840, 634);
     m_minSize = wxSize(840, 634);
-    SetSettingsAccess(
-        [](const char* key) { return GetAppConfig().GetString(key); },
-        [](const char* key, const std::string& value) {
-            GetAppConfig().SetString(key, value.c_str());
-        });
+    SetSettingsAccess([](const char* key) { return GetAppConfig().GetString(key); },
+                      [](const char* key, const std::string& value) {
+                          GetAppConfig().SetString(key, value.c_str());
+                      });
     AppConfig& config = GetAppConfig();
     m_afterConvert = config.GetInt("afterconvert");
     Bind(wxEVT_MENU, &CAudioEncDlg::OnCommand, this);
@@ -85,6 +86,12 @@ CAudioEncDlg::CAudioEncDlg()
     });
     Bind(wxEVT_CLOSE_WINDOW, &CAudioEncDlg::OnClose, this);
     Bind(wxEVT_TIMER, &CAudioEncDlg::OnTimer, this);
+    Bind(wxEVT_PAINT, [this](wxPaintEvent& event) {
+        if (m_firstPaintMs == 0) {
+            m_firstPaintMs = wxGetUTCTimeMillis().GetValue();
+        }
+        event.Skip();
+    });
     Bind(wxEVT_ICONIZE, [this](wxIconizeEvent& event) {
         if (!event.IsIconized()) {
             RecalcLayout();
@@ -165,6 +172,17 @@ void CAudioEncDlg::CreatePanels() {
     m_panels[Output] = new ImSkinPanel(this, 1005, "OutputPanel");
     m_panels[Player] = new ImSkinPanel(this, 1008, "PlayerPanel");
     m_panels[Rip] = new ImSkinPanel(this, 1063, "CDRip");
+    // The lists' own context menus; their commands travel to this window like the bar's.
+    const std::pair<Panel, int> contextMenus[] = {{MediaList, kMediaListContextMenu},
+                                                  {Rip, kRipListContextMenu},
+                                                  {Creator, kBurnListContextMenu}};
+    for (const auto& [panel, menuId] : contextMenus) {
+        m_panels[panel]->Bind(wxEVT_CONTEXT_MENU, [this, menuId = menuId](wxContextMenuEvent&) {
+            std::unique_ptr<wxMenu> menu = BuildContextMenu(menuId);
+            TranslatePopupMenu(*menu, menuId);
+            PopupMenu(menu.get());
+        });
+    }
     m_panels[Output]->SetSize(-1, kOutputPanelHeight + 10);
     m_panels[Status]->SetSize(-1, kStatusPanelHeight);
     m_panels[Player]->SetSize(-1, kPlayerHeight);
@@ -214,8 +232,8 @@ void CAudioEncDlg::FillSkinMenu(wxMenu& popup) {
             continue;
         }
         wxMenuItem* item = popup.AppendCheckItem(id, wxString::FromUTF8(config.GetName()));
-        item->Check(wxString::FromUTF8(SkinNameOf(dir)).IsSameAs(
-            wxString::FromUTF8(g_Skin.GetSkinName()), false));
+        item->Check(wxString::FromUTF8(SkinNameOf(dir))
+                        .IsSameAs(wxString::FromUTF8(g_Skin.GetSkinName()), false));
         m_skinCommands[id++] = dir;
     }
 }
@@ -282,7 +300,8 @@ void CAudioEncDlg::RecalcLayout() {
     const wxRect column(rightX, content.y + gapHeight, rightW,
                         std::max(0, content.height - gapHeight - m_metrics.BottomMargin));
     for (Panel list : {MediaList, Rip, Creator}) {
-        LayoutRow(column, 1, 0, m_panels[list], {m_panels[list], m_panels[Output], m_panels[Status]});
+        LayoutRow(column, 1, 0, m_panels[list],
+                  {m_panels[list], m_panels[Output], m_panels[Status]});
     }
     const wxRect side(left, content.y + 4, sideWidth,
                       std::max(0, content.height - 4 - m_metrics.BottomMargin));
@@ -299,8 +318,9 @@ void CAudioEncDlg::OnTimer(wxTimerEvent& event) {
         return;
     }
     const int mode = GetWorkMode();
-    const std::string path =
-        GetAppConfig().GetString(mode == 2 ? "burntemp" : mode == 1 ? "OutputCDDir" : "OutputDir");
+    const std::string path = GetAppConfig().GetString(mode == 2   ? "burntemp"
+                                                      : mode == 1 ? "OutputCDDir"
+                                                                  : "OutputDir");
     wxLongLong freeBytes;
     if (!path.empty() && wxDirExists(wxString::FromUTF8(path)) &&
         wxGetDiskSpace(wxString::FromUTF8(path), nullptr, &freeBytes) &&
@@ -380,31 +400,37 @@ void CAudioEncDlg::OnCommand(wxCommandEvent& event) {
         return;
     }
     switch (id) {
-    case cmd::kExit:
-        Close();
-        return;
-    case cmd::kBackground:
-        ToTray();
-        return;
-    case cmd::kTrayOpen:
-        FromTray();
-        return;
-    case cmd::kTrayExit:
-        Close();
-        return;
-    case cmd::kSupport:
-        wxLaunchDefaultBrowser("https://velmorant.example/support");
-        return;
-    case cmd::kAbout: {
-        const ProductStrings& product = GetAppConfig().GetProductStrings();
-        wxMessageBox(wxString::FromUTF8(product.productFullName + " " AC_VERSION),
-                     wxString::FromUTF8(product.productName), wxOK | wxICON_INFORMATION, this);
-        return;
-    }
-    default:
-        // Commands of the list panels arrive here once those panels exist.
-        event.Skip();
-        return;
+        case cmd::kExit:
+            Close();
+            return;
+        case cmd::kBackground:
+            ToTray();
+            return;
+        case cmd::kTrayOpen:
+            FromTray();
+            return;
+        case cmd::kTrayExit:
+            Close();
+            return;
+        case cmd::kChooseSkinDialog: {
+            ImChooseSkinDlg dialog(this);
+            dialog.ShowModal();
+            LoadModeMenu(GetWorkMode());
+            return;
+        }
+        case cmd::kSupport:
+            wxLaunchDefaultBrowser("https://velmorant.example/support");
+            return;
+        case cmd::kAbout: {
+            const ProductStrings& product = GetAppConfig().GetProductStrings();
+            wxMessageBox(wxString::FromUTF8(product.productFullName + " " AC_VERSION),
+                         wxString::FromUTF8(product.productName), wxOK | wxICON_INFORMATION, this);
+            return;
+        }
+        default:
+            // Commands of the list panels arrive here once those panels exist.
+            event.Skip();
+            return;
     }
 }
 
@@ -414,8 +440,8 @@ std::string CAudioEncDlg::DescribeState() const {
     out << "title=" << GetTitle().utf8_string() << "\n";
     out << "rect=" << r.x << "," << r.y << "," << r.width << "," << r.height << "\n";
     out << "mode=" << GetWorkMode() << "\n";
-    static const char* const kNames[PanelCount] = {"MediaList", "CDCreatorPanel", "OutputPanel",
-                                                   "PlayerPanel", "CDRip", "SideBar",
+    static const char* const kNames[PanelCount] = {"MediaList",   "CDCreatorPanel", "OutputPanel",
+                                                   "PlayerPanel", "CDRip",          "SideBar",
                                                    "StatusBar"};
     out << "visible=";
     for (int i = 0; i < PanelCount; ++i) {
@@ -439,13 +465,15 @@ std::string CAudioEncDlg::DescribeState() const {
     }
     out << "tabs=";
     for (int i = 0; i < 3; ++i) {
-        out << m_check->Tab(i)->GetLabel().utf8_string() << (m_check->Tab(i)->IsEnabled() ? "+" : "-")
-            << "|";
+        out << m_check->Tab(i)->GetLabel().utf8_string()
+            << (m_check->Tab(i)->IsEnabled() ? "+" : "-") << "|";
     }
     out << "\n";
     out << "skin=" << g_Skin.GetSkinName() << "\n";
     out << "language=" << g_Language.GetLanguageName() << "\n";
     out << "corners=" << (HasFlag(wxFRAME_SHAPED) ? 1 : 0) << "\n";
+    out << "firstpaint_ms=" << m_firstPaintMs << "\n";
+    out << "resize_ms=" << m_lastBench << "\n";
     return out.str();
 }
 
@@ -500,6 +528,19 @@ void CAudioEncDlg::RunScriptCommand(const std::string& line) {
                 }
             }
         }
+    } else if (verb == "benchresize") {
+        // Repaint time after a resize, for bench/skin_bench.sh: each step resizes and paints.
+        int steps = 50;
+        in >> steps;
+        const wxRect start = GetRect();
+        const wxLongLong begin = wxGetUTCTimeUSec();
+        for (int i = 0; i < steps; ++i) {
+            SetSize(start.width + (i % 10) * 12, start.height + (i % 7) * 9);
+            Update();
+        }
+        const double perStep = (wxGetUTCTimeUSec() - begin).ToDouble() / 1000.0 / steps;
+        SetSize(start);
+        m_lastBench = perStep;
     } else if (verb == "close") {
         Close();
     }

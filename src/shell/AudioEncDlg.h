@@ -79,6 +79,9 @@ private:
     int m_sideBarWidth = 200;
     int m_checkRightMargin = 5;
     int m_checkGapHeight = 27;
+    // Measured for the benchmarks only.
+    long long m_firstPaintMs = 0;
+    double m_lastBench = 0;
 };
 
 extern CAudioEncDlg* g_MainDlg;

@@ -18,29 +18,37 @@ struct MenuRow {
 };
 
 // Shared by all three bars: Options and Help.
-#define AC_OPTIONS_AND_HELP                                                                      \
-    {0, Row::Caption, 0, "&Options"}, {1, Row::Popup, cmd::kChangeSkin, "Change &Skin..."},      \
-        {1, Row::Popup, cmd::kLanguage, "Language"}, {1, Row::Separator, 0, ""},                 \
-        {1, Row::Command, cmd::kPreferences, "Preferences..."}, {0, Row::Caption, 0, "&Help"},   \
-        {1, Row::Command, cmd::kContents, "Contents"}, {1, Row::Command, cmd::kSupport, "Support"}, \
-        {1, Row::Separator, 0, ""}, {1, Row::Command, cmd::kAbout, "&About..."}
+#define AC_OPTIONS_AND_HELP                                                                    \
+    {0, Row::Caption, 0, "&Options"}, {1, Row::Popup, cmd::kChangeSkin, "Change &Skin..."},    \
+        {1, Row::Popup, cmd::kLanguage, "Language"}, {1, Row::Separator, 0, ""},               \
+        {1, Row::Command, cmd::kPreferences, "Preferences..."}, {0, Row::Caption, 0, "&Help"}, \
+        {1, Row::Command, cmd::kContents, "Contents"},                                         \
+        {1, Row::Command, cmd::kSupport, "Support"}, {1, Row::Separator, 0, ""}, {             \
+        1, Row::Command, cmd::kAbout, "&About..."                                              \
+    }
 
-#define AC_AFTER_CONVERTING(depth)                                                               \
-    {depth, Row::Popup, 0, "A&fter Converting"}, {depth + 1, Row::Check, 33109, "No action"},    \
+#define AC_AFTER_CONVERTING(depth)                                                                \
+    {depth, Row::Popup, 0, "A&fter Converting"}, {depth + 1, Row::Check, 33109, "No action"},     \
         {depth + 1, Row::Check, 33110, "Shut Down"}, {depth + 1, Row::Check, 33111, "Hibernate"}, \
-        {depth + 1, Row::Check, 33112, "Standby"}, {depth + 1, Row::Check, 33113, "Kill me"}
+        {depth + 1, Row::Check, 33112, "Standby"}, {                                              \
+        depth + 1, Row::Check, 33113, "Kill me"                                                   \
+    }
 
-#define AC_CHECK_UNCHECK                                                                         \
-    {1, Row::Popup, 0, "&Check"}, {2, Row::Command, 32782, "&All"},                              \
-        {2, Row::Command, 33038, "&Selected Items"}, {1, Row::Popup, 0, "&Uncheck"},             \
-        {2, Row::Command, 32783, "&All"}, {2, Row::Command, 33037, "&Selected Items"}
+#define AC_CHECK_UNCHECK                                                             \
+    {1, Row::Popup, 0, "&Check"}, {2, Row::Command, 32782, "&All"},                  \
+        {2, Row::Command, 33038, "&Selected Items"}, {1, Row::Popup, 0, "&Uncheck"}, \
+        {2, Row::Command, 32783, "&All"}, {                                          \
+        2, Row::Command, 33037, "&Selected Items"                                    \
+    }
 
-#define AC_FILE_ADD_REMOVE                                                                       \
-    {0, Row::Caption, 0, "&File"}, {1, Row::Command, 32771, "&Add..."},                          \
-        {1, Row::Command, 33053, "Add Folder"}, {1, Row::Separator, 0, ""},                      \
-        {1, Row::Command, 32772, "&Remove"}, {1, Row::Command, 32773, "&Clear"},                 \
-        {1, Row::Separator, 0, ""}, {1, Row::Command, cmd::kBackground, "BackGround"},           \
-        {1, Row::Separator, 0, ""}, {1, Row::Command, cmd::kExit, "E&xit"}
+#define AC_FILE_ADD_REMOVE                                                             \
+    {0, Row::Caption, 0, "&File"}, {1, Row::Command, 32771, "&Add..."},                \
+        {1, Row::Command, 33053, "Add Folder"}, {1, Row::Separator, 0, ""},            \
+        {1, Row::Command, 32772, "&Remove"}, {1, Row::Command, 32773, "&Clear"},       \
+        {1, Row::Separator, 0, ""}, {1, Row::Command, cmd::kBackground, "BackGround"}, \
+        {1, Row::Separator, 0, ""}, {                                                  \
+        1, Row::Command, cmd::kExit, "E&xit"                                           \
+    }
 
 const MenuRow kConvertRows[] = {
     AC_FILE_ADD_REMOVE,
@@ -136,9 +144,9 @@ const MenuRow kRipListContextRows[] = {
 };
 
 const MenuRow kBurnListContextRows[] = {
-    {0, Row::Command, 33136, "Burn CD"},       {0, Row::Command, 33077, "Stop Burn CD"},
-    {0, Row::Command, 32771, "&Add..."},       {0, Row::Command, 32772, "&Remove"},
-    {0, Row::Command, 32773, "&Clear"},        {0, Row::Command, 33045, "Show File Infomation"},
+    {0, Row::Command, 33136, "Burn CD"}, {0, Row::Command, 33077, "Stop Burn CD"},
+    {0, Row::Command, 32771, "&Add..."}, {0, Row::Command, 32772, "&Remove"},
+    {0, Row::Command, 32773, "&Clear"},  {0, Row::Command, 33045, "Show File Infomation"},
 };
 
 const MenuRow kTrayRows[] = {
@@ -157,23 +165,23 @@ std::size_t FillMenu(wxMenu& menu, std::span<const MenuRow> rows, std::size_t at
         const MenuRow& row = rows[at++];
         const wxString text = wxString::FromUTF8(row.text);
         switch (row.kind) {
-        case Row::Separator:
-            menu.AppendSeparator();
-            break;
-        case Row::Command:
-            menu.Append(row.id, text);
-            break;
-        case Row::Check:
-            menu.AppendCheckItem(row.id, text);
-            break;
-        case Row::Popup: {
-            auto* sub = new wxMenu;
-            at = FillMenu(*sub, rows, at, depth + 1);
-            menu.AppendSubMenu(sub, text);
-            break;
-        }
-        case Row::Caption:
-            return at - 1;
+            case Row::Separator:
+                menu.AppendSeparator();
+                break;
+            case Row::Command:
+                menu.Append(row.id, text);
+                break;
+            case Row::Check:
+                menu.AppendCheckItem(row.id, text);
+                break;
+            case Row::Popup: {
+                auto* sub = new wxMenu;
+                at = FillMenu(*sub, rows, at, depth + 1);
+                menu.AppendSubMenu(sub, text);
+                break;
+            }
+            case Row::Caption:
+                return at - 1;
         }
     }
     return at;
@@ -181,12 +189,12 @@ std::size_t FillMenu(wxMenu& menu, std::span<const MenuRow> rows, std::size_t at
 
 std::span<const MenuRow> RowsOfMode(int mode) {
     switch (mode) {
-    case 1:
-        return kRipRows;
-    case 2:
-        return kBurnRows;
-    default:
-        return kConvertRows;
+        case 1:
+            return kRipRows;
+        case 2:
+            return kBurnRows;
+        default:
+            return kConvertRows;
     }
 }
 
@@ -225,20 +233,20 @@ wxMenu* SelectCdRomPopup(ImMenu& menu) {
 std::unique_ptr<wxMenu> BuildContextMenu(int menuId) {
     std::span<const MenuRow> rows;
     switch (menuId) {
-    case kMediaListContextMenu:
-        rows = kMediaListContextRows;
-        break;
-    case kRipListContextMenu:
-        rows = kRipListContextRows;
-        break;
-    case kBurnListContextMenu:
-        rows = kBurnListContextRows;
-        break;
-    case kTrayMenu:
-        rows = kTrayRows;
-        break;
-    default:
-        return nullptr;
+        case kMediaListContextMenu:
+            rows = kMediaListContextRows;
+            break;
+        case kRipListContextMenu:
+            rows = kRipListContextRows;
+            break;
+        case kBurnListContextMenu:
+            rows = kBurnListContextRows;
+            break;
+        case kTrayMenu:
+            rows = kTrayRows;
+            break;
+        default:
+            return nullptr;
     }
     auto menu = std::make_unique<wxMenu>();
     FillMenu(*menu, rows, 0, 0);

@@ -17,7 +17,8 @@ namespace {
 
 class TestHookTimer : public wxTimer {
 public:
-    TestHookTimer(CAudioEncDlg* dialog, std::string dir) : m_dialog(dialog), m_dir(std::move(dir)) {}
+    TestHookTimer(CAudioEncDlg* dialog, std::string dir)
+        : m_dialog(dialog), m_dir(std::move(dir)) {}
 
     void Notify() override {
         if (!m_dialog) {

@@ -38,7 +38,10 @@ public:
     explicit ImCaptionBar(wxWindow* parent);
     bool OnSkinChanged(const std::string& skinDir) override;
     int GetBarHeight() const { return m_height; }
-    void SetSmallIcon(const wxBitmap& icon) { m_icon = icon; Refresh(); }
+    void SetSmallIcon(const wxBitmap& icon) {
+        m_icon = icon;
+        Refresh();
+    }
     void SetMenu(class wxMenu* menu) { m_menu = menu; }
 
 private:
@@ -67,8 +70,14 @@ private:
 class ImStatusBarCtrl : public wxWindow {
 public:
     explicit ImStatusBarCtrl(wxWindow* parent);
-    void SetPicture(SkinPicture picture) { m_picture = std::move(picture); Refresh(); }
-    void SetText(const wxString& text) { m_text = text; Refresh(); }
+    void SetPicture(SkinPicture picture) {
+        m_picture = std::move(picture);
+        Refresh();
+    }
+    void SetText(const wxString& text) {
+        m_text = text;
+        Refresh();
+    }
 
 private:
     void OnPaint(wxPaintEvent& event);

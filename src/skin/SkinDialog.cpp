@@ -69,10 +69,10 @@ bool ImSkinDialog::OnSkinChanged(const std::string& skinDir) {
         if (colour == -1) {
             colour = m_skin.GetInt(kButtonKeys[i], -1, "Main");
         }
-        m_look.buttonText[i] =
-            colour != -1 ? NativeColour(static_cast<std::uint32_t>(colour))
-                         : wxSystemSettings::GetColour(i == 3 ? wxSYS_COLOUR_GRAYTEXT
-                                                              : wxSYS_COLOUR_BTNTEXT);
+        m_look.buttonText[i] = colour != -1
+                                   ? NativeColour(static_cast<std::uint32_t>(colour))
+                                   : wxSystemSettings::GetColour(i == 3 ? wxSYS_COLOUR_GRAYTEXT
+                                                                        : wxSYS_COLOUR_BTNTEXT);
     }
     m_look.bgMode = m_skin.GetInt("BgMode", 0, section);
     m_look.bgHSplitter = m_skin.GetInt("BgHSplitter", -1, section);
@@ -201,8 +201,8 @@ bool ImSkinDialog::InGrip(const wxPoint& screenPoint) const {
     }
     const wxRect r = top->GetScreenRect();
     const SkinMetrics& m = skinned->m_metrics;
-    return InResizeGrip(screenPoint.x - r.x, screenPoint.y - r.y, r.width, r.height,
-                        m.RightMargin, m.BottomMargin, m.BorderWidth);
+    return InResizeGrip(screenPoint.x - r.x, screenPoint.y - r.y, r.width, r.height, m.RightMargin,
+                        m.BottomMargin, m.BorderWidth);
 }
 
 void ImSkinDialog::OnLeftDown(wxMouseEvent& event) {

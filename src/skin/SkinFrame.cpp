@@ -39,9 +39,8 @@ bool ImSkinFrame::OnSkinChanged(const std::string& skinDir) {
     static const char* const kCornerKeys[4] = {"RegionLT", "RegionRT", "RegionLB", "RegionRB"};
     for (int i = 0; i < 4; ++i) {
         const std::string file = m_skin.GetString(kCornerKeys[i], "", "Main");
-        m_cornerRuns[i] =
-            file.empty() ? std::vector<SkinRect>{}
-                         : LoadRegionResource(g_Skin.GetImagePath(&g_Language, file));
+        m_cornerRuns[i] = file.empty() ? std::vector<SkinRect>{}
+                                       : LoadRegionResource(g_Skin.GetImagePath(&g_Language, file));
     }
     const bool taken = ImSkinDialog::OnSkinChanged(skinDir);
     ApplyCorners();

@@ -191,8 +191,8 @@ std::vector<CapacityRun> CapacityRuns(long long position, long long range, long 
     }
     const int filled =
         static_cast<int>(std::min<long long>(position, range) * width / range) + leftMargin;
-    const bool marks = maximum > 0 && nearMark > 0 && overMark > 0 && nearMark < maximum &&
-                       overMark < maximum;
+    const bool marks =
+        maximum > 0 && nearMark > 0 && overMark > 0 && nearMark < maximum && overMark < maximum;
     auto add = [&](int x0, int x1, CapacityFill fill) {
         x1 = std::min(x1, filled);
         if (x1 > x0) {
@@ -211,8 +211,7 @@ std::vector<CapacityRun> CapacityRuns(long long position, long long range, long 
     return runs;
 }
 
-std::vector<ScaleTick> CapacityScale(long long maximum, long long step, int width,
-                                     int leftMargin) {
+std::vector<ScaleTick> CapacityScale(long long maximum, long long step, int width, int leftMargin) {
     std::vector<ScaleTick> ticks;
     if (maximum <= 0 || step <= 0) {
         return ticks;
@@ -317,8 +316,7 @@ std::pair<std::string, char> SplitMnemonic(std::string_view text) {
     for (std::size_t i = 0; i < text.size(); ++i) {
         if (text[i] == '&') {
             if (i + 1 < text.size()) {
-                mnemonic = static_cast<char>(
-                    std::tolower(static_cast<unsigned char>(text[i + 1])));
+                mnemonic = static_cast<char>(std::tolower(static_cast<unsigned char>(text[i + 1])));
             }
             continue;
         }
@@ -374,6 +372,35 @@ std::pair<int, int> PlacePopupBeside(int parentX, int parentY, int parentW, int 
         x = 0;
     }
     return {x, y};
+}
+
+SkinRect ListCheckBox(const SkinRect& cell, bool hasText) {
+    constexpr int kSide = 13;
+    const int x = hasText ? cell.x + 9 : cell.x + (cell.w - kSide) / 2;
+    return {x, cell.y + (cell.h - kSide) / 2, kSide, kSide};
+}
+
+std::vector<SkinRect> ListTickStrokes(const SkinRect& box) {
+    std::vector<SkinRect> strokes;
+    int x = box.x + 10;
+    int y = box.y + 4;
+    for (int i = 0; i < 7; ++i) {
+        strokes.push_back({x, y, 1, 3});
+        --x;
+        y += i < 3 ? 1 : -1;
+    }
+    return strokes;
+}
+
+int ListProgressWidth(int cellWidth, int percent) {
+    if (percent <= 0 || cellWidth <= 0) {
+        return 0;
+    }
+    return cellWidth * std::min(percent, 100) / 100;
+}
+
+int NextHeaderCheckState(int state, int rowCount) {
+    return state == 1 && rowCount > 0 ? 2 : 1;
 }
 
 }  // namespace ac

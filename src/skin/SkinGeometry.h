@@ -35,7 +35,7 @@ struct SkinBlit {
 
 struct SplitPlan {
     std::vector<SkinBlit> blits;
-    SkinRect fill;      // the middle: one colour,
+    SkinRect fill;        // the middle: one colour,
     int fillSourceX = 0;  // taken from this source pixel
     int fillSourceY = 0;
 };
@@ -131,5 +131,16 @@ std::pair<int, int> PlacePopupUnderBar(int x, int y, int w, int h, int barHeight
 // A submenu beside row rowTop of a parent popup at (parentX, parentY), parentW wide.
 std::pair<int, int> PlacePopupBeside(int parentX, int parentY, int parentW, int rowTop, int w,
                                      int h, int screenW, int screenH);
+
+// List cells. The 13 x 13 check box stands 9 pixels in from the cell's left, vertically
+// centred, or centred both ways in a cell without text.
+SkinRect ListCheckBox(const SkinRect& cell, bool hasText);
+// The tick: seven vertical strokes of 3 pixels, right to left from 10 right and 4 down of the
+// box's corner; the first four step down a pixel each, the last three back up.
+std::vector<SkinRect> ListTickStrokes(const SkinRect& box);
+// Width of the filled part of a progress cell; 0 percent draws no bar at all.
+int ListProgressWidth(int cellWidth, int percent);
+// A header check box click: unchecked with rows becomes checked, anything else unchecked.
+int NextHeaderCheckState(int state, int rowCount);
 
 }  // namespace ac

@@ -155,10 +155,9 @@ void ImMenuPopup::OpenChild(int row) {
     m_pChild->Measure();
     const wxPoint origin = GetScreenPosition();
     const wxSize screen = wxGetDisplaySize();
-    const auto [x, y] = PlacePopupBeside(origin.x, origin.y, m_width,
-                                         m_rects[static_cast<std::size_t>(row)].y,
-                                         m_pChild->m_width, m_pChild->m_height, screen.x,
-                                         screen.y);
+    const auto [x, y] =
+        PlacePopupBeside(origin.x, origin.y, m_width, m_rects[static_cast<std::size_t>(row)].y,
+                         m_pChild->m_width, m_pChild->m_height, screen.x, screen.y);
     m_pChild->ShowAt(x, y);
 }
 
@@ -224,37 +223,37 @@ bool ImMenuPopup::OnKey(int key) {
         return -1;
     };
     switch (key) {
-    case WXK_DOWN:
-        m_hot = step(m_hot < 0 ? -1 : m_hot, 1);
-        m_pChild.reset();
-        Refresh(false);
-        return true;
-    case WXK_UP:
-        m_hot = step(m_hot < 0 ? 0 : m_hot, -1);
-        m_pChild.reset();
-        Refresh(false);
-        return true;
-    case WXK_RIGHT:
-        if (m_hot >= 0 && !IsDead(m_hot) &&
-            m_pMenu->FindItemByPosition(static_cast<std::size_t>(m_hot))->IsSubMenu()) {
-            OpenChild(m_hot);
-            if (m_pChild) {
-                m_pChild->OnKey(WXK_DOWN);
-            }
-            return true;
-        }
-        return false;
-    case WXK_LEFT:
-        if (m_pChild && m_pChild->m_bShown) {
+        case WXK_DOWN:
+            m_hot = step(m_hot < 0 ? -1 : m_hot, 1);
             m_pChild.reset();
+            Refresh(false);
             return true;
-        }
-        return false;
-    case WXK_RETURN:
-    case WXK_NUMPAD_ENTER:
-        return m_hot >= 0 && Activate(m_hot);
-    default:
-        break;
+        case WXK_UP:
+            m_hot = step(m_hot < 0 ? 0 : m_hot, -1);
+            m_pChild.reset();
+            Refresh(false);
+            return true;
+        case WXK_RIGHT:
+            if (m_hot >= 0 && !IsDead(m_hot) &&
+                m_pMenu->FindItemByPosition(static_cast<std::size_t>(m_hot))->IsSubMenu()) {
+                OpenChild(m_hot);
+                if (m_pChild) {
+                    m_pChild->OnKey(WXK_DOWN);
+                }
+                return true;
+            }
+            return false;
+        case WXK_LEFT:
+            if (m_pChild && m_pChild->m_bShown) {
+                m_pChild.reset();
+                return true;
+            }
+            return false;
+        case WXK_RETURN:
+        case WXK_NUMPAD_ENTER:
+            return m_hot >= 0 && Activate(m_hot);
+        default:
+            break;
     }
     if (key > 0 && key < 128) {
         const char lower = static_cast<char>(std::tolower(key));
@@ -302,8 +301,8 @@ void ImMenuPopup::OnPaint(wxPaintEvent& /*event*/) {
         const bool hot = row == m_hot && !dead;
         if (hot) {
             dc.SetPen(*wxTRANSPARENT_PEN);
-            dc.SetBrush(wxBrush(c.useColours ? c.selectBg
-                                             : wxSystemSettings::GetColour(wxSYS_COLOUR_HIGHLIGHT)));
+            dc.SetBrush(wxBrush(
+                c.useColours ? c.selectBg : wxSystemSettings::GetColour(wxSYS_COLOUR_HIGHLIGHT)));
             dc.DrawRectangle(4, r.y + 1, m_width - 8, r.h - 2);
             if (!c.useColours) {
                 dc.SetPen(*wxBLACK_PEN);
@@ -313,8 +312,8 @@ void ImMenuPopup::OnPaint(wxPaintEvent& /*event*/) {
         }
         dc.SetPen(*wxBLACK_PEN);
         if (item->IsSubMenu()) {
-            const wxPoint arrow[] = {{m_width - 12, mid + 4}, {m_width - 8, mid},
-                                     {m_width - 12, mid - 4}};
+            const wxPoint arrow[] = {
+                {m_width - 12, mid + 4}, {m_width - 8, mid}, {m_width - 12, mid - 4}};
             dc.SetBrush(*wxBLACK_BRUSH);
             dc.DrawPolygon(3, arrow);
         }
@@ -324,11 +323,13 @@ void ImMenuPopup::OnPaint(wxPaintEvent& /*event*/) {
         }
         wxColour colour;
         if (dead) {
-            colour = c.useColours ? c.disableText : wxSystemSettings::GetColour(wxSYS_COLOUR_GRAYTEXT);
+            colour =
+                c.useColours ? c.disableText : wxSystemSettings::GetColour(wxSYS_COLOUR_GRAYTEXT);
         } else if (hot) {
             colour = c.useColours ? c.selectedText : wxSystemSettings::GetColour(wxSYS_COLOUR_MENU);
         } else {
-            colour = c.useColours ? c.normalText : wxSystemSettings::GetColour(wxSYS_COLOUR_MENUTEXT);
+            colour =
+                c.useColours ? c.normalText : wxSystemSettings::GetColour(wxSYS_COLOUR_MENUTEXT);
         }
         dc.SetTextForeground(colour);
         const wxString label = text.BeforeFirst('\t');
@@ -351,8 +352,8 @@ ImMenuBar::ImMenuBar(wxWindow* parent, ImSkinDialog* owner)
       m_owner(owner) {
     SetBackgroundStyle(wxBG_STYLE_PAINT);
     Bind(wxEVT_PAINT, &ImMenuBar::OnPaint, this);
-    for (auto type : {wxEVT_MOTION, wxEVT_LEFT_DOWN, wxEVT_LEFT_UP, wxEVT_LEAVE_WINDOW,
-                      wxEVT_LEFT_DCLICK}) {
+    for (auto type :
+         {wxEVT_MOTION, wxEVT_LEFT_DOWN, wxEVT_LEFT_UP, wxEVT_LEAVE_WINDOW, wxEVT_LEFT_DCLICK}) {
         Bind(type, &ImMenuBar::OnMouse, this);
     }
     Bind(wxEVT_KEY_DOWN, &ImMenuBar::OnKeyDown, this);
@@ -613,45 +614,45 @@ void ImMenuBar::OnKeyDown(wxKeyEvent& event) {
     const int key = event.GetKeyCode();
     const bool popupShown = m_popup && m_popup->IsPopupShown();
     switch (key) {
-    case WXK_TAB:
-        event.Skip();
-        return;
-    case WXK_RETURN:
-    case WXK_NUMPAD_ENTER:
-    case WXK_DOWN:
-        if (popupShown && m_popup->OnKey(key)) {
+        case WXK_TAB:
+            event.Skip();
             return;
-        }
-        if (!m_bOpen && m_hot >= 0 && m_hot < m_itemCount) {
-            m_bOpen = true;
+        case WXK_RETURN:
+        case WXK_NUMPAD_ENTER:
+        case WXK_DOWN:
+            if (popupShown && m_popup->OnKey(key)) {
+                return;
+            }
+            if (!m_bOpen && m_hot >= 0 && m_hot < m_itemCount) {
+                m_bOpen = true;
+                Refresh(false);
+                OpenEntry(m_hot);
+            }
+            return;
+        case WXK_ESCAPE:
+            if (popupShown) {
+                CloseMenus();
+            }
+            return;
+        case WXK_LEFT:
+        case WXK_RIGHT: {
+            if (popupShown && m_popup->OnKey(key)) {
+                return;
+            }
+            if (m_itemCount == 0) {
+                return;
+            }
+            const int by = key == WXK_LEFT ? -1 : 1;
+            m_hot = ((m_hot < 0 ? 0 : m_hot + by) + m_itemCount) % m_itemCount;
             Refresh(false);
-            OpenEntry(m_hot);
-        }
-        return;
-    case WXK_ESCAPE:
-        if (popupShown) {
-            CloseMenus();
-        }
-        return;
-    case WXK_LEFT:
-    case WXK_RIGHT: {
-        if (popupShown && m_popup->OnKey(key)) {
+            if (m_bOpen) {
+                OpenEntry(m_hot);
+            }
+            m_ignoreMoves = 3;
             return;
         }
-        if (m_itemCount == 0) {
-            return;
-        }
-        const int by = key == WXK_LEFT ? -1 : 1;
-        m_hot = ((m_hot < 0 ? 0 : m_hot + by) + m_itemCount) % m_itemCount;
-        Refresh(false);
-        if (m_bOpen) {
-            OpenEntry(m_hot);
-        }
-        m_ignoreMoves = 3;
-        return;
-    }
-    default:
-        break;
+        default:
+            break;
     }
     if (popupShown && m_popup->OnKey(key)) {
         return;

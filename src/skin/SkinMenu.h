@@ -94,7 +94,10 @@ public:
     ImMenu* GetMenu() const { return m_menu.get(); }
     void Measure();
     void SetUseColors(bool use) { m_colours.useColours = use; }
-    void SetColours(const MenuColours& colours) { m_colours = colours; Refresh(); }
+    void SetColours(const MenuColours& colours) {
+        m_colours = colours;
+        Refresh();
+    }
     const MenuColours& Colours() const { return m_colours; }
     void CloseMenus();
     // Before the owner goes: the popups are freed while the bar can still reach them.
@@ -134,8 +137,8 @@ private:
     int m_splitCol = 0;
     wxColour m_textColour;
     // Entry rectangles come from the skin's Menu section.
-    int m_itemLeft = 0, m_itemWidth = 66, m_itemHeight = 16, m_itemCountSkin = 4,
-        m_itemSpacing = 3, m_marginTop = 3;
+    int m_itemLeft = 0, m_itemWidth = 66, m_itemHeight = 16, m_itemCountSkin = 4, m_itemSpacing = 3,
+        m_marginTop = 3;
 };
 
 }  // namespace ac

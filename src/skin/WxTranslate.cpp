@@ -69,8 +69,8 @@ void WxMenuBarAdapter::SetItemText(int position, const std::string& text) {
 }
 
 ITranslatableMenu* WxMenuBarAdapter::GetSubMenu(int position) {
-    m_children.push_back(
-        std::make_unique<WxMenuAdapter>(m_menu.tops[static_cast<std::size_t>(position)].second.get()));
+    m_children.push_back(std::make_unique<WxMenuAdapter>(
+        m_menu.tops[static_cast<std::size_t>(position)].second.get()));
     return m_children.back().get();
 }
 

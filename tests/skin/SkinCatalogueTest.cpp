@@ -32,8 +32,10 @@ protected:
             {"skin/Default/", ""},
             {"skin/Default/skin.ini",
              "[Main]\r\nName=Plain\r\nLeftMargin=7\r\nBorderWidth=3\r\nTextColor=0xFF0000\r\n"
-             "BgColor=-1\r\nLong=" + std::string(1023, 'x') + "\r\n"
-             "[Menu]\r\nFontName=Serif\r\nFontSize=120\r\nFontItalic=1\r\n"},
+             "BgColor=-1\r\nLong=" +
+                 std::string(1023, 'x') +
+                 "\r\n"
+                 "[Menu]\r\nFontName=Serif\r\nFontSize=120\r\nFontItalic=1\r\n"},
             {"skin/Blue/", ""},
             {"skin/Blue/skin.ini", "[Main]\r\nName=Blue sky\r\n"},
             {"skin/Nameless/", ""},

@@ -293,10 +293,37 @@ TEST(MenuTest, PopupsFlipAboveTheBarOrToTheLeftNearScreenEdges) {
     EXPECT_EQ(PlacePopupUnderBar(1200, 60, 150, 200, 26, 1280, 1024).first, 1130);
     EXPECT_EQ(PlacePopupUnderBar(-20, 60, 150, 200, 26, 1280, 1024).first, 0);
 
-    EXPECT_EQ(PlacePopupBeside(100, 100, 150, 30, 120, 200, 1280, 1024),
-              std::make_pair(250, 130));
+    EXPECT_EQ(PlacePopupBeside(100, 100, 150, 30, 120, 200, 1280, 1024), std::make_pair(250, 130));
     EXPECT_EQ(PlacePopupBeside(1100, 100, 150, 30, 120, 200, 1280, 1024).first, 980);
     EXPECT_EQ(PlacePopupBeside(100, 900, 150, 30, 120, 200, 1280, 1024).second, 774);
+}
+
+}  // namespace
+}  // namespace ac
+
+namespace ac {
+namespace {
+
+TEST(ListCellTest, CheckBoxSitsNinePixelsInOrCentredWithoutText) {
+    EXPECT_EQ(ListCheckBox({100, 20, 80, 21}, true), (SkinRect{109, 24, 13, 13}));
+    EXPECT_EQ(ListCheckBox({100, 20, 80, 21}, false), (SkinRect{133, 24, 13, 13}));
+}
+
+TEST(ListCellTest, TickGoesDownFourStrokesThenUpThree) {
+    const auto strokes = ListTickStrokes({0, 0, 13, 13});
+    ASSERT_EQ(strokes.size(), 7u);
+    EXPECT_EQ(strokes[0], (SkinRect{10, 4, 1, 3}));
+    EXPECT_EQ(strokes[3], (SkinRect{7, 7, 1, 3}));
+    EXPECT_EQ(strokes[6], (SkinRect{4, 4, 1, 3}));
+}
+
+TEST(ListCellTest, ProgressAndHeaderStates) {
+    EXPECT_EQ(ListProgressWidth(200, 0), 0);
+    EXPECT_EQ(ListProgressWidth(200, 50), 100);
+    EXPECT_EQ(ListProgressWidth(200, 250), 200);
+    EXPECT_EQ(NextHeaderCheckState(1, 3), 2);
+    EXPECT_EQ(NextHeaderCheckState(1, 0), 1) << "an empty list keeps its header unchecked";
+    EXPECT_EQ(NextHeaderCheckState(2, 3), 1);
 }
 
 }  // namespace
