@@ -52,7 +52,11 @@ function(ac_add_test name)
   else()
     add_test(NAME ${name} COMMAND ${name})
   endif()
-  set_tests_properties(${name} PROPERTIES TIMEOUT 600 ENVIRONMENT "${ARG_ENV}")
+  set(environment ${ARG_ENV})
+  if(AC_TSAN)
+    list(APPEND environment "TSAN_OPTIONS=suppressions=${CMAKE_SOURCE_DIR}/tests/tsan.supp")
+  endif()
+  set_tests_properties(${name} PROPERTIES TIMEOUT 600 ENVIRONMENT "${environment}")
 endfunction()
 
 # ac_add_fuzzer(NAME SOURCE [LIBS ...]): a libFuzzer target, built only with AC_FUZZ and clang.

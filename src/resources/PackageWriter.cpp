@@ -207,7 +207,6 @@ bool PackageWriter::Create() {
 }
 
 PackageWriter::OpenResult PackageWriter::OpenMemory(std::string bytes) {
-    PrepareZipLibrary();
     auto* memory = new MemoryArchive;
     memory->data = std::move(bytes);
     zip_error_init(&memory->error);

@@ -6,7 +6,6 @@
 #include <zip.h>
 
 #include <algorithm>
-#include <ctime>
 
 namespace ac {
 namespace {
@@ -21,14 +20,6 @@ constexpr std::size_t kReadChunk = 64 * 1024;
 
 }  // namespace
 
-void PrepareZipLibrary() {
-    // libzip converts entry dates with the C library's local-time calls, whose first use sets
-    // up the time zone lazily. Doing that once here, before two threads can both be first,
-    // keeps the setup off the race.
-    static std::once_flag once;
-    std::call_once(once, [] { ::tzset(); });
-}
-
 std::string ZipArchive::LookupKey(std::string_view name) {
     std::string key;
     key.reserve(name.size());
@@ -42,7 +33,6 @@ std::string ZipArchive::LookupKey(std::string_view name) {
 }
 
 std::shared_ptr<ZipArchive> ZipArchive::Open(const std::string& filePath) {
-    PrepareZipLibrary();
     int error = 0;
     zip_t* handle = zip_open(filePath.c_str(), ZIP_RDONLY, &error);
     if (handle == nullptr) {
@@ -57,7 +47,6 @@ std::shared_ptr<ZipArchive> ZipArchive::Open(const std::string& filePath) {
 }
 
 std::shared_ptr<ZipArchive> ZipArchive::OpenFromMemory(std::string bytes) {
-    PrepareZipLibrary();
     std::shared_ptr<ZipArchive> archive(new ZipArchive);
     archive->m_bytes = std::move(bytes);
     zip_error_t error;

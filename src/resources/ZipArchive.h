@@ -18,9 +18,6 @@ struct zip;
 
 namespace ac {
 
-// Call before any libzip use on a thread that may race another (the openers here do).
-void PrepareZipLibrary();
-
 // Bit 4 of the DOS attributes in the low byte of an entry's external attributes.
 inline constexpr std::uint32_t kDirectoryAttribute = 0x10;
 
