@@ -10,6 +10,7 @@
 
 #include "convert/CommandLine.h"
 #include "convert/OutputNaming.h"
+#include "convert/RowParameters.h"
 #include "medialist/MediaProbe.h"
 #include "platform/Paths.h"
 #include "profile/ParameterSet.h"
@@ -77,30 +78,6 @@ bool ParseArguments(int argc, char** argv, Options& options) {
         }
     }
     return !options.files.empty();
-}
-
-// A row's parameter set, seen by the engine through the little it needs. Reading the cut of a
-// set rebuilds its command line, so the progress display on the main thread would write the set
-// while the driver builds the row's command from it; nothing edits the set during a terminal
-// run, so the cut is read once, before any thread starts, and the set is the driver's alone.
-class ProfileParameters : public JobParameters {
-public:
-    explicit ProfileParameters(std::unique_ptr<ParameterSet> set)
-        : m_set(std::move(set)),
-          m_duration(m_set->GetDuration()),
-          m_startTime(m_set->GetStartTime()) {}
-    std::int64_t GetDuration() const override { return m_duration; }
-    std::int64_t GetStartTime() const override { return m_startTime; }
-    ParameterSet& Set() { return *m_set; }
-
-private:
-    std::unique_ptr<ParameterSet> m_set;
-    const std::int64_t m_duration;
-    const std::int64_t m_startTime;
-};
-
-ParameterSet& SetOf(MediaItem& item) {
-    return static_cast<ProfileParameters&>(*item.parameters).Set();
 }
 
 // Held through its base: the profile keeps its value lists in a type of its own.
@@ -175,7 +152,7 @@ std::unique_ptr<MediaItem> MakeRow(const std::string& sourcePath, const std::str
     if (probed)
         ApplyTags(*set, &item->info);
     set->SetValue("outfilename", name);
-    item->parameters = std::make_unique<ProfileParameters>(std::move(set));
+    item->parameters = std::make_unique<RowParameters>(std::move(set));
     item->SetStatus(probed ? JobStatus::Idle : JobStatus::UnknownFile);
     return item;
 }
@@ -269,11 +246,11 @@ int main(int argc, char** argv) {
         request.row = row;
         request.lastOutput = lastOutput;
         request.directory = directory;
-        return MakeOutputPath(SetOf(item), request, naming);
+        return MakeOutputPath(*SetOf(item), request, naming);
     };
     CommandBuilder builder = [](MediaItem& item) {
         return BuildConversionCommandText(item.sourcePath, item.outputPath, item.volume,
-                                          SetOf(item));
+                                          *SetOf(item));
     };
     return run.Run(driverConfig, namer, builder, g_stopRequested);
 }
