@@ -34,6 +34,7 @@ public:
         }
         frame->Show();
         CallAfter([frame, list] {
+            list->SyncRowCount();
             list->Body()->Update();
             const int frames = 200;
             const wxLongLong begin = wxGetUTCTimeUSec();

@@ -59,7 +59,8 @@ EncodingDriver::EncodingDriver(IMediaList& list, IDriverHost& host, DriverConfig
       m_config(std::move(config)),
       m_namer(std::move(namer)),
       m_builder(std::move(builder)),
-      m_freeSpace(VolumeFreeBytes) {}
+      m_freeSpace(VolumeFreeBytes),
+      m_afterConvertAction(m_config.afterConvertAction) {}
 
 EncodingDriver::~EncodingDriver() {
     Stop();
@@ -469,7 +470,7 @@ void EncodingDriver::OnRunFinished() {
     m_runPending = 0;
     if (m_config.playSound)
         m_host.PlaySound(m_config.soundPath);
-    int action = m_config.afterConvertAction;
+    int action = m_afterConvertAction.load();
     if (action >= 0 && action <= 3)
         m_host.StartAfterRunAction(action);
     else if (action != 4)

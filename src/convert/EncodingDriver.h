@@ -126,6 +126,8 @@ public:
 
     void OnProcessExit(CEncodeProcess* process);
     void OnRunFinished();
+    // The after-run action chosen in the menu while the program runs.
+    void SetAfterConvertAction(int action) { m_afterConvertAction = action; }
     // The 3-second timer of the main dialog: stops the run when the output volume runs low.
     void CheckDiskSpace();
 
@@ -164,6 +166,7 @@ private:
     std::atomic<int> m_runningCount{0};
     std::atomic<int> m_runPending{0};
     std::atomic<int> m_driverStop{0};
+    std::atomic<int> m_afterConvertAction{4};
     // One 0x466 per run end, however many passes see the end before the UI thread handles it.
     std::atomic<int> m_finishPosted{0};
 

@@ -82,6 +82,20 @@ std::string ExecutableDirectory() {
     return ParentOf(std::string(buffer, static_cast<size_t>(length)));
 }
 
+std::string FindConversionTool() {
+    std::string forced = Environment("AC_CTT_PATH");
+    if (!forced.empty()) {
+        return forced;
+    }
+    const std::string here = ExecutableDirectory();
+    for (const std::string& candidate : {here + "/ctt", here + "/../lib/audio-converter/ctt"}) {
+        if (::access(candidate.c_str(), X_OK) == 0) {
+            return candidate;
+        }
+    }
+    return here + "/ctt";
+}
+
 std::string FindBaseDirectory() {
     std::string overridden = Environment("AUDIOCONV_BASEDIR");
     if (!overridden.empty()) {

@@ -26,6 +26,10 @@ std::string UserConfigDirectory();
 // The user's music folder (XDG user-dirs MUSIC), else ~/Music.
 std::string MusicDirectory();
 
+// The conversion tool: AC_CTT_PATH if set (tests put a fake there); else ctt beside the
+// executable (the build tree) or in <prefix>/lib/audio-converter (installed).
+std::string FindConversionTool();
+
 // Creates a directory and its parents (mode 0700 for new ones under the user's home).
 bool EnsureDirectory(const std::string& path);
 

@@ -1,13 +1,21 @@
 #include "shell/AudioEncDlg.h"
 
+#include "medialist/ui/MediaListWnd.h"
+#include "medialist/ui/OutputPanelWnd.h"
+#include "panels/StatusWnd.h"
 #include "platform/Paths.h"
+#include "profile/ui/SideBarWnd.h"
 #include "resources/Language.h"
 #include "shell/AppConfig.h"
 #include "shell/Check.h"
+#include "shell/ConvertMode.h"
 #include "shell/MenuTables.h"
+#include "shell/MessageBoxes.h"
+#include "skin/AboutDlg.h"
 #include "skin/ChooseSkinDlg.h"
 #include "skin/SkinBars.h"
 #include "skin/SkinMenu.h"
+#include "skin/UiQueueWx.h"
 #include "skin/WxTranslate.h"
 
 #include <wx/dcmemory.h>
@@ -26,11 +34,8 @@ CAudioEncDlg* g_MainDlg = nullptr;
 
 namespace {
 
-// Free space below which a run stops: 200 MB.
+// Free space below which a burn stops: 200 MB.
 constexpr long long kLowDiskBytes = 209715200LL;
-// Default heights of the shared panels until their own subsystems size them.
-constexpr int kOutputPanelHeight = 64;
-constexpr int kStatusPanelHeight = 96;
 constexpr int kPlayerHeight = 280;
 
 // afterconvert keeps 0 shut down, 1 standby, 2 hibernate, 3 exit, 4 none; the menu lists
@@ -101,6 +106,12 @@ CAudioEncDlg::CAudioEncDlg()
 }
 
 CAudioEncDlg::~CAudioEncDlg() {
+    if (m_convert) {
+        m_convert->Shutdown();
+    }
+    if (GetMainHub() == this) {
+        SetMainHub(nullptr);
+    }
     if (g_MainDlg == this) {
         g_MainDlg = nullptr;
     }
@@ -137,6 +148,8 @@ wxBitmap CAudioEncDlg::MakeIcon(int size) const {
 void CAudioEncDlg::OnInitDialog() {
     InitialPlacement();
     g_MainDlg = this;
+    InstallWxUiQueue();
+    SetMainHub(this);
     wxIconBundle icons;
     for (int size : {16, 32, 48}) {
         wxIcon icon;
@@ -157,7 +170,13 @@ void CAudioEncDlg::OnInitDialog() {
         mode = 0;
     }
     LoadModeMenu(mode);
+    m_convert = std::make_unique<CConvertMode>(this);
+    m_convert->SetWorkMode(mode);
+    m_convert->Start();
     ShowModePanel(mode);
+    if (g_SideBar != nullptr) {
+        g_SideBar->OnWorkModeChanged(mode);
+    }
     m_diskTimer.Start(3000);
     RecalcLayout();
 }
@@ -165,16 +184,15 @@ void CAudioEncDlg::OnInitDialog() {
 void CAudioEncDlg::CreatePanels() {
     // Order of creation is the order of skin notices.
     m_check = new CCheck(this);
-    m_panels[Status] = new ImSkinPanel(this, 1031, "StatusBar");
+    m_panels[Status] = new CStatusWnd(this);
     m_panels[Creator] = new ImSkinPanel(this, 1001, "CDCreatorPanel");
-    m_panels[SideBar] = new ImSkinPanel(this, 1011, "SideBar");
-    m_panels[MediaList] = new ImSkinPanel(this, 1001, "MediaList");
-    m_panels[Output] = new ImSkinPanel(this, 1005, "OutputPanel");
+    m_panels[SideBar] = new CSideBarWnd(this);
+    m_panels[MediaList] = new CMediaListWnd(this);
+    m_panels[Output] = new COutputPanelWnd(this);
     m_panels[Player] = new ImSkinPanel(this, 1008, "PlayerPanel");
     m_panels[Rip] = new ImSkinPanel(this, 1063, "CDRip");
-    // The lists' own context menus; their commands travel to this window like the bar's.
-    const std::pair<Panel, int> contextMenus[] = {{MediaList, kMediaListContextMenu},
-                                                  {Rip, kRipListContextMenu},
+    // The context menus of the lists still to come; the media list opens its own.
+    const std::pair<Panel, int> contextMenus[] = {{Rip, kRipListContextMenu},
                                                   {Creator, kBurnListContextMenu}};
     for (const auto& [panel, menuId] : contextMenus) {
         m_panels[panel]->Bind(wxEVT_CONTEXT_MENU, [this, menuId = menuId](wxContextMenuEvent&) {
@@ -183,8 +201,6 @@ void CAudioEncDlg::CreatePanels() {
             PopupMenu(menu.get());
         });
     }
-    m_panels[Output]->SetSize(-1, kOutputPanelHeight + 10);
-    m_panels[Status]->SetSize(-1, kStatusPanelHeight);
     m_panels[Player]->SetSize(-1, kPlayerHeight);
 }
 
@@ -193,6 +209,9 @@ int CAudioEncDlg::GetWorkMode() const {
 }
 
 void CAudioEncDlg::ShowModePanel(int mode) {
+    if (g_MediaList != nullptr && mode != 0 && g_MediaList->IsShown()) {
+        g_MediaList->OnHidePanel();
+    }
     m_panels[MediaList]->Show(mode == 0);
     m_panels[Rip]->Show(mode == 1);
     m_panels[Creator]->Show(mode == 2);
@@ -204,9 +223,33 @@ void CAudioEncDlg::SwitchMode(int mode) {
         return;
     }
     ShowModePanel(mode);
+    if (m_convert) {
+        m_convert->SetWorkMode(mode);
+    }
+    OnListSelectionChanged(mode == 0 && g_MediaList != nullptr ? g_MediaList->GetFirstSelected()
+                                                               : -1);
+    if (g_StatusWnd != nullptr) {
+        g_StatusWnd->OnModeChanged(mode);
+    }
+    if (g_SideBar != nullptr && g_SideBar->GetProfileCount() > 0) {
+        const int index = m_check->m_profileIndex[static_cast<std::size_t>(mode)];
+        if (mode != 2 || g_SideBar->GetSelectedIndex() != index) {
+            g_SideBar->SelectIndex(index, true);
+        }
+    }
     LoadModeMenu(mode);
-    // The output panel owns this key once it exists; until then the main window stores it.
-    GetAppConfig().SetInt("last_run_function", mode);
+    if (g_OutputPanel != nullptr) {
+        g_OutputPanel->SetMode(mode);  // stores last_run_function
+    }
+    if (g_SideBar != nullptr) {
+        g_SideBar->OnWorkModeChanged(mode);
+    }
+    if (g_StatusWnd != nullptr) {
+        g_StatusWnd->ClearLog();
+    }
+    if (mode == 0 && g_MediaList != nullptr) {
+        g_MediaList->OnShowPanel();
+    }
     RecalcLayout();
 }
 
@@ -251,6 +294,7 @@ void CAudioEncDlg::FillLanguageMenu(wxMenu& popup) {
 }
 
 void CAudioEncDlg::OnInitMenuPopup(wxMenu* menu) {
+    ApplyEnableRules(*menu);
     for (int id = cmd::kAfterFirst; id <= cmd::kAfterLast; ++id) {
         if (wxMenuItem* item = menu->FindChildItem(id)) {
             item->Check(kAfterConvertOfCommand[id - cmd::kAfterFirst] == m_afterConvert);
@@ -289,6 +333,12 @@ void CAudioEncDlg::RecalcLayout() {
     if (m_check == nullptr || m_panels[Status] == nullptr) {
         return;
     }
+    if (g_OutputPanel != nullptr) {
+        m_panels[Output]->SetSize(-1, g_OutputPanel->GetNeededHeight() + 10);
+    }
+    if (g_StatusWnd != nullptr) {
+        m_panels[Status]->SetSize(-1, g_StatusWnd->GetNeededHeight());
+    }
     const int sideWidth = m_sideBarWidth;
     const int rightMargin = m_checkRightMargin;
     const int gapHeight = m_checkGapHeight;
@@ -310,17 +360,21 @@ void CAudioEncDlg::RecalcLayout() {
 
 void CAudioEncDlg::OnTimer(wxTimerEvent& event) {
     if (event.GetId() == kSelectionTimer) {
-        // The lists hand their selection to the side bar here once they exist.
         m_selectionTimer.Stop();
+        HandOverSelectedSets();
         return;
     }
     if (event.GetId() != kDiskTimer) {
         return;
     }
     const int mode = GetWorkMode();
-    const std::string path = GetAppConfig().GetString(mode == 2   ? "burntemp"
-                                                      : mode == 1 ? "OutputCDDir"
-                                                                  : "OutputDir");
+    if (mode == 0) {
+        if (m_convert) {
+            m_convert->CheckDiskSpace();
+        }
+        return;
+    }
+    const std::string path = GetAppConfig().GetString(mode == 2 ? "burntemp" : "OutputCDDir");
     wxLongLong freeBytes;
     if (!path.empty() && wxDirExists(wxString::FromUTF8(path)) &&
         wxGetDiskSpace(wxString::FromUTF8(path), nullptr, &freeBytes) &&
@@ -353,9 +407,8 @@ void CAudioEncDlg::FromTray() {
 }
 
 bool CAudioEncDlg::RunStopLogic() {
-    // The runs of each mode belong to their panels; none is under way until those exist, so the
-    // stop question is never needed here yet.
-    m_bCloseAccepted = true;
+    // Rip and burn runs come with their panels; only the convert mode can refuse yet.
+    m_bCloseAccepted = GetWorkMode() != 0 || !m_convert || m_convert->StopForClose();
     return m_bCloseAccepted;
 }
 
@@ -366,6 +419,9 @@ void CAudioEncDlg::OnClose(wxCloseEvent& event) {
     }
     m_diskTimer.Stop();
     m_selectionTimer.Stop();
+    if (m_convert) {
+        m_convert->Shutdown();
+    }
     if (!IsShown()) {
         Show();
     }
@@ -397,6 +453,16 @@ void CAudioEncDlg::OnCommand(wxCommandEvent& event) {
     if (id >= cmd::kAfterFirst && id <= cmd::kAfterLast) {
         m_afterConvert = kAfterConvertOfCommand[id - cmd::kAfterFirst];
         GetAppConfig().SetInt("afterconvert", m_afterConvert);
+        if (m_convert) {
+            m_convert->SetAfterConvertAction(m_afterConvert);
+        }
+        return;
+    }
+    // Commands of another mode do nothing when they arrive anyway.
+    if (m_convert && m_convert->IsOwnCommand(id)) {
+        if (GetWorkMode() == 0) {
+            m_convert->OnCommand(id);
+        }
         return;
     }
     switch (id) {
@@ -422,9 +488,9 @@ void CAudioEncDlg::OnCommand(wxCommandEvent& event) {
             wxLaunchDefaultBrowser("https://velmorant.example/support");
             return;
         case cmd::kAbout: {
-            const ProductStrings& product = GetAppConfig().GetProductStrings();
-            wxMessageBox(wxString::FromUTF8(product.productFullName + " " AC_VERSION),
-                         wxString::FromUTF8(product.productName), wxOK | wxICON_INFORMATION, this);
+            ImAboutDlg about(this);
+            about.m_imagePath = GetAppConfig().GetBaseDirectory() + "/help/velmorantabout.jpg";
+            about.ShowModal();
             return;
         }
         default:

@@ -4,6 +4,7 @@
 //
 // Thread contract: UI thread only. Workers reach it through the UI-thread bridge.
 
+#include "shell/MainHub.h"
 #include "skin/SkinDialog.h"
 
 #include <wx/timer.h>
@@ -12,19 +13,21 @@
 #include <map>
 #include <memory>
 #include <string>
+#include <vector>
 
 class wxTaskBarIcon;
 
 namespace ac {
 
 class CCheck;
+class CConvertMode;
 class ImMenuBar;
 
 inline constexpr int kMainDialogId = 102;
 inline constexpr int kDiskTimer = 111;
 inline constexpr int kSelectionTimer = 100;
 
-class CAudioEncDlg : public ImSkinFrame {
+class CAudioEncDlg : public ImSkinFrame, public IMainHub {
 public:
     CAudioEncDlg();
     ~CAudioEncDlg() override;
@@ -44,6 +47,27 @@ public:
     void SwitchMode(int mode);
     int GetWorkMode() const;
 
+    // IMainHub: how the panels reach each other (AudioEncHub.cpp).
+    int WorkMode() override { return GetWorkMode(); }
+    void PostCommand(int commandId) override;
+    bool IsCommandEnabled(int commandId) override;
+    void ShowContextMenu(wxWindow* owner, int menuId) override;
+    void OnListSelectionChanged(int row) override;
+    void SetStatusText(const std::string& text) override;
+    void SetBitRateAllowed(bool allowed) override;
+    void ShowFileInfo(MediaItem* item) override;
+    void ApplyProfile(Profile& profile) override;
+    void OnProfileChosen(int index) override;
+    void OnCatalogueLoaded() override;
+    std::vector<ParameterSet*> SelectedSets() override;
+    void EditSets(const std::function<void()>& edit) override;
+    void SetSelectedVolume(int volume, bool firstOnly) override;
+    int RememberedProfileIndex(int mode) override;
+    void RememberProfileIndex(int mode, int index) override;
+    bool IsConvertRunActive() override;
+    double RunDoneSeconds() override;
+    double RunTotalSeconds() override;
+
     // One line per fact, for the window tests' hook.
     std::string DescribeState() const;
     void RunScriptCommand(const std::string& line);
@@ -57,6 +81,10 @@ private:
     void FillLanguageMenu(wxMenu& popup);
     void ShowModePanel(int mode);
     void OnCommand(wxCommandEvent& event);
+    void DispatchCommand(int id);
+    void ApplyEnableRules(wxMenu& menu);
+    void HandOverSelectedSets();
+    static bool IsBitRateFree(const std::string& extension);
     void OnClose(wxCloseEvent& event);
     void OnTimer(wxTimerEvent& event);
     void ToTray();
@@ -69,6 +97,7 @@ private:
     wxTimer m_diskTimer;
     wxTimer m_selectionTimer;
     std::unique_ptr<wxTaskBarIcon> m_tray;
+    std::unique_ptr<CConvertMode> m_convert;
     bool m_bInTray = false;
     bool m_bCloseAccepted = true;
     std::map<int, std::string> m_skinCommands;

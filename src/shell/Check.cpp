@@ -29,6 +29,7 @@ void CCheck::OnLanguageChanged() {
         m_tabs[std::size_t(i)]->SetLabel(kTabTexts[i]);
     }
     TranslateWindow(*this, m_nDialogId);
+    RecalcLayout();
 }
 
 bool CCheck::OnSkinChanged(const std::string& skinDir) {
@@ -37,6 +38,7 @@ bool CCheck::OnSkinChanged(const std::string& skinDir) {
     const wxFont font = MakeSkinFont(m_skin.GetFont(section));
     const wxPoint textOffset(m_skin.GetInt("BtnTextPosX", 0, section),
                              m_skin.GetInt("BtnTextPosY", 0, section));
+    m_textOffsetX = textOffset.x;
     wxColour colours[4];
     static const char* const kColourKeys[4] = {"TextColorUp", "TextColorDown", "TextColorActive",
                                                "TextColorDisabled"};
@@ -66,6 +68,9 @@ void CCheck::RecalcLayout() {
         if (size.x <= 0 || size.y <= 0) {
             size = wxSize(90, std::max(18, client.y - 2));
         }
+        // A longer translation ("Konvertieren") widens the face instead of being clipped.
+        const int textWidth = tab->GetTextExtent(tab->GetLabel()).x;
+        size.x = std::max(size.x, textWidth + 2 * std::max(8, m_textOffsetX));
         tab->SetSize(x, client.y - size.y, size.x, size.y);
         x += size.x + m_metrics.HSpacing;
     }

@@ -33,6 +33,7 @@ public:
 
 private:
     std::array<ImButton*, 3> m_tabs{};
+    int m_textOffsetX = 0;
 };
 
 extern CCheck* g_Check;

@@ -87,8 +87,24 @@ int XListCtrl::InsertItem(int index, const std::string& text) {
     row[0].text = text;
     m_rows.insert(m_rows.begin() + index, std::move(row));
     m_selected.insert(m_selected.begin() + index, 0);
-    m_body->SetRowCount(m_rows.size());
+    ScheduleRowCount();
     return index;
+}
+
+void XListCtrl::ScheduleRowCount() {
+    // Telling the scroll bars costs a GTK relayout; a batch of thousands of rows tells them once.
+    if (m_rowCountPosted) {
+        return;
+    }
+    m_rowCountPosted = true;
+    CallAfter([this] { SyncRowCount(); });
+}
+
+void XListCtrl::SyncRowCount() {
+    m_rowCountPosted = false;
+    if (m_body->GetRowCount() != m_rows.size()) {
+        m_body->SetRowCount(m_rows.size());
+    }
 }
 
 bool XListCtrl::DeleteItem(int row) {
@@ -97,7 +113,7 @@ bool XListCtrl::DeleteItem(int row) {
     }
     m_rows.erase(m_rows.begin() + row);
     m_selected.erase(m_selected.begin() + row);
-    m_body->SetRowCount(m_rows.size());
+    ScheduleRowCount();
     if (m_rows.empty()) {
         for (XListColumn& column : m_columns) {
             column.headerCheck = column.headerCheck != 0 ? 1 : 0;
@@ -438,18 +454,22 @@ void XListBody::DrawCell(wxDC& dc, const wxRect& rect, const XListCell& cell,
             dc.DrawRectangle(bar);
         }
         if (cell.bShowProgressText) {
-            const wxString label = wxString::FromUTF8(ProgressText(cell));
+            const std::string utf8 = ProgressText(cell);
+            const wxString label = wxString::FromUTF8(utf8);
+            const wxSize extent = MeasureText(dc, utf8, label);
+            const wxPoint at(frame.x + (frame.width - extent.x) / 2,
+                             frame.y + (frame.height - extent.y) / 2);
             // Drawn twice, clipped at the bar's end, so the letters invert over the filled part.
             {
                 wxDCClipper clip(dc,
                                  wxRect(bar.GetRight() + 1, frame.y, frame.width, frame.height));
                 dc.SetTextForeground(text);
-                dc.DrawLabel(label, frame, wxALIGN_CENTER);
+                dc.DrawText(label, at);
             }
             if (filled > 0) {
                 wxDCClipper clip(dc, bar);
                 dc.SetTextForeground(*wxWHITE);
-                dc.DrawLabel(label, frame, wxALIGN_CENTER);
+                dc.DrawText(label, at);
             }
         }
         return;
@@ -477,12 +497,29 @@ void XListBody::DrawCell(wxDC& dc, const wxRect& rect, const XListCell& cell,
     dc.SetTextForeground(selected ? wxSystemSettings::GetColour(wxSYS_COLOUR_HIGHLIGHTTEXT) : text);
     // One measure per cell: the fit test gives the height that centres the line as well.
     const wxString full = wxString::FromUTF8(cell.text);
-    const wxSize extent = dc.GetTextExtent(full);
+    const wxSize extent = MeasureText(dc, cell.text, full);
     const wxString label = extent.x <= textRect.width
                                ? full
                                : wxControl::Ellipsize(full, dc, wxELLIPSIZE_END, textRect.width);
     wxDCClipper clip(dc, textRect);
     dc.DrawText(label, textRect.x, textRect.y + (textRect.height - extent.y) / 2);
+}
+
+wxSize XListBody::MeasureText(wxDC& dc, const std::string& key, const wxString& text) const {
+    // Measuring through pango is most of a frame's cost; a list repeats few distinct texts.
+    if (m_measuredFont != GetFont()) {
+        m_extents.clear();
+        m_measuredFont = GetFont();
+    }
+    if (auto found = m_extents.find(key); found != m_extents.end()) {
+        return found->second;
+    }
+    if (m_extents.size() >= kMaxMeasuredTexts) {
+        m_extents.clear();
+    }
+    const wxSize extent = dc.GetTextExtent(text);
+    m_extents.emplace(key, extent);
+    return extent;
 }
 
 void XListBody::OnPaint(wxPaintEvent& /*event*/) {
@@ -568,6 +605,7 @@ void XListBody::OnKey(wxKeyEvent& event) {
     if (row >= 0) {
         m_list->SelectRow(row);
         m_anchor = row;
+        m_list->SyncRowCount();
         if (static_cast<size_t>(row) < GetVisibleRowsBegin() ||
             static_cast<size_t>(row) >= GetVisibleRowsEnd()) {
             ScrollToRow(static_cast<size_t>(row));

@@ -13,6 +13,7 @@
 #include <wx/window.h>
 
 #include <string>
+#include <unordered_map>
 #include <vector>
 
 namespace ac {
@@ -84,6 +85,9 @@ public:
     const std::vector<XListColumn>& Columns() const { return m_columns; }
     const XListCell* Cell(int row, int column) const;
     XListBody* Body() const { return m_body; }
+    // The scroll range follows inserts and deletes on the next turn of the event loop; callers
+    // that scroll at once bring it up to date first.
+    void SyncRowCount();
 
 private:
     friend class XListBody;
@@ -91,6 +95,7 @@ private:
     XListCell* CellOf(int row, int column);
     void UpdateHeaderCheckFromRows(int column);
     void PlaceParts();
+    void ScheduleRowCount();
 
     std::vector<XListColumn> m_columns;
     std::vector<std::vector<XListCell>> m_rows;
@@ -99,6 +104,7 @@ private:
     XListBody* m_body;
     int m_rowHeight = 17;
     int m_headerHeight = 24;
+    bool m_rowCountPosted = false;
     wxColour m_textColour;
     wxColour m_bgColour;
     wxColour m_disabledColour;
@@ -135,8 +141,12 @@ private:
     void OnPaint(wxPaintEvent& event);
     void OnLeftDown(wxMouseEvent& event);
     void OnKey(wxKeyEvent& event);
+    wxSize MeasureText(wxDC& dc, const std::string& key, const wxString& text) const;
     XListCtrl* m_list;
     int m_anchor = -1;
+    static constexpr std::size_t kMaxMeasuredTexts = 8192;
+    mutable std::unordered_map<std::string, wxSize> m_extents;
+    mutable wxFont m_measuredFont;
 };
 
 }  // namespace ac

@@ -63,7 +63,7 @@ void ImButton::OnPaint(wxPaintEvent& /*event*/) {
     }
     const int ch = CellHeight();
     if (ch > 0) {
-        DrawPictureCell(dc, 0, 0, m_picture, wxRect(0, cell * ch, m_picture.Width(), ch));
+        DrawWidenedCell(dc, 0, 0, size.x, m_picture, wxRect(0, cell * ch, m_picture.Width(), ch));
     }
     if (m_bText) {
         static constexpr int kColourOfCell[4] = {2, 0, 1, 3};

@@ -146,6 +146,30 @@ void DrawPictureCell(wxDC& dc, int x, int y, const SkinPicture& picture, const w
     dc.Blit(x, y, inside.width, inside.height, &source, inside.x, inside.y);
 }
 
+void DrawWidenedCell(wxDC& dc, int x, int y, int width, const SkinPicture& picture,
+                     const wxRect& cell) {
+    const wxRect inside = cell.Intersect(wxRect(0, 0, picture.Width(), picture.Height()));
+    if (!picture.IsOk() || inside.IsEmpty() || width <= inside.width) {
+        DrawPictureCell(dc, x, y, picture, cell);
+        return;
+    }
+    wxImage source = picture.fromPng ? picture.image.GetSubImage(inside)
+                                     : picture.bitmap.GetSubBitmap(inside).ConvertToImage();
+    const int half = inside.width / 2;
+    const int rightWidth = inside.width - half;
+    wxImage widened(width, inside.height);
+    if (source.HasAlpha()) {
+        widened.InitAlpha();
+    }
+    widened.Paste(source.GetSubImage(wxRect(0, 0, half, inside.height)), 0, 0);
+    const wxImage middle = source.GetSubImage(wxRect(half, 0, 1, inside.height))
+                               .Scale(width - inside.width + 1, inside.height);
+    widened.Paste(middle, half, 0);
+    widened.Paste(source.GetSubImage(wxRect(half, 0, rightWidth, inside.height)),
+                  width - rightWidth, 0);
+    dc.DrawBitmap(wxBitmap(widened), x, y, true);
+}
+
 wxFont MakeSkinFont(const SkinFont& font) {
     wxFontInfo info(std::max(1, font.size) / 10.0);
     // The Windows face names that skins carry have no meaning here: take the desktop's face.

@@ -44,6 +44,10 @@ void DrawSplitPicture(wxDC& dc, const wxRect& target, const SkinPicture& picture
 void DrawTiledPicture(wxDC& dc, const wxRect& target, const SkinPicture& picture);
 // One cell of a picture cut into equal parts stacked top to bottom (buttons) or a grid cell.
 void DrawPictureCell(wxDC& dc, int x, int y, const SkinPicture& picture, const wxRect& cell);
+// The same cell drawn `width` wide: both halves as they are, the middle column stretched, so a
+// face can grow for a longer translation without distorting its rounded ends.
+void DrawWidenedCell(wxDC& dc, int x, int y, int width, const SkinPicture& picture,
+                     const wxRect& cell);
 
 inline wxColour NativeColour(std::uint32_t native) {
     return wxColour(native & 0xFF, (native >> 8) & 0xFF, (native >> 16) & 0xFF);

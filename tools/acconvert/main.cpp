@@ -184,16 +184,6 @@ void AddSource(console::ConsoleRun& run, const std::string& path, const Paramete
         run.AddRow(MakeRow(path + "|" + std::to_string(track), titles[track - 1], profile));
 }
 
-std::string FindTool() {
-    if (const char* forced = std::getenv("AC_CTT_PATH"); forced && *forced)
-        return forced;
-    std::string here = platform::ExecutableDirectory();
-    for (std::string candidate : {here + "/ctt", here + "/../lib/audio-converter/ctt"})
-        if (::access(candidate.c_str(), X_OK) == 0)
-            return fs::weakly_canonical(candidate).string();
-    return here + "/ctt";
-}
-
 }  // namespace
 
 int main(int argc, char** argv) {
@@ -222,7 +212,7 @@ int main(int argc, char** argv) {
         driverConfig.maxRunningProcesses = options.jobs;
         driverConfig.maxProcesses = std::max(driverConfig.maxProcesses, options.jobs);
     }
-    driverConfig.toolPath = FindTool();
+    driverConfig.toolPath = platform::FindConversionTool();
     driverConfig.toolDirectory = base;
     // The end-of-run sound and after-run action belong to the window; a terminal run has none.
     driverConfig.afterConvertAction = 4;

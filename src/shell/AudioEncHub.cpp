@@ -1,0 +1,229 @@
+// CAudioEncDlg as the panels' hub: the selection step, the profile setter, the catalogue's
+// messages and the routing of panel calls to the panel of the mode.
+
+#include "convert/RowParameters.h"
+#include "medialist/ui/MediaListWnd.h"
+#include "panels/StatusWnd.h"
+#include "profile/ParameterSet.h"
+#include "profile/ui/SideBarWnd.h"
+#include "shell/AppConfig.h"
+#include "shell/AudioEncDlg.h"
+#include "shell/Check.h"
+#include "shell/ConvertMode.h"
+#include "shell/MenuTables.h"
+#include "skin/WxTranslate.h"
+
+#include <wx/menu.h>
+
+#include <strings.h>
+
+namespace ac {
+
+void CAudioEncDlg::PostCommand(int commandId) {
+    CallAfter([this, commandId] { DispatchCommand(commandId); });
+}
+
+void CAudioEncDlg::DispatchCommand(int id) {
+    wxCommandEvent command(wxEVT_MENU, id);
+    OnCommand(command);
+}
+
+bool CAudioEncDlg::IsCommandEnabled(int commandId) {
+    if (GetWorkMode() == 0 && m_convert && m_convert->IsOwnCommand(commandId)) {
+        return m_convert->IsCommandEnabled(commandId);
+    }
+    return true;
+}
+
+void CAudioEncDlg::ApplyEnableRules(wxMenu& menu) {
+    for (wxMenuItem* item : menu.GetMenuItems()) {
+        if (item->IsSubMenu()) {
+            ApplyEnableRules(*item->GetSubMenu());
+        } else if (!item->IsSeparator()) {
+            item->Enable(IsCommandEnabled(item->GetId()));
+        }
+    }
+}
+
+void CAudioEncDlg::ShowContextMenu(wxWindow* owner, int menuId) {
+    std::unique_ptr<wxMenu> menu = BuildContextMenu(menuId);
+    TranslatePopupMenu(*menu, menuId);
+    ApplyEnableRules(*menu);
+    // The menu's commands travel up from the owner to this window like the bar's do.
+    (owner != nullptr ? owner : this)->PopupMenu(menu.get());
+}
+
+void CAudioEncDlg::OnListSelectionChanged(int row) {
+    const int mode = GetWorkMode();
+    if (mode != 0 || g_MediaList == nullptr) {
+        return;
+    }
+    if (row < 0) {
+        return;
+    }
+    MediaItem* selected = g_MediaList->GetItem(row);
+    // Only the selected row's child talks to the status panel and the log.
+    for (MediaItem* item : g_MediaList->Items()) {
+        if (CEncodeProcess* process = item->process.load()) {
+            process->Link(nullptr, nullptr);
+        }
+    }
+    if (g_StatusWnd != nullptr) {
+        g_StatusWnd->SetStatusText(std::string());
+        g_StatusWnd->ClearLog();
+    }
+    if (selected != nullptr) {
+        CEncodeProcess* process = selected->process.load();
+        const JobStatus status = selected->Status();
+        if (process != nullptr && g_StatusWnd != nullptr) {
+            if (status != JobStatus::Idle && status != JobStatus::Waiting &&
+                status != JobStatus::UnknownFile) {
+                process->Link(g_StatusWnd, g_StatusWnd);
+            }
+            process->ReplayErrorLines();
+        }
+    }
+    if (g_MediaList->SelectedSets().size() < 2) {
+        HandOverSelectedSets();
+    } else if (!m_selectionTimer.IsRunning()) {
+        m_selectionTimer.StartOnce(500);
+    }
+}
+
+void CAudioEncDlg::HandOverSelectedSets() {
+    if (g_SideBar != nullptr) {
+        g_SideBar->SetSets(SelectedSets());
+    }
+}
+
+void CAudioEncDlg::SetStatusText(const std::string& text) {
+    if (g_StatusWnd != nullptr) {
+        g_StatusWnd->SetStatusText(text);
+    }
+}
+
+void CAudioEncDlg::SetBitRateAllowed(bool allowed) {
+    if (g_SideBar != nullptr) {
+        g_SideBar->SetBitRateAllowed(allowed);
+    }
+}
+
+void CAudioEncDlg::ShowFileInfo(MediaItem* /*item*/) {
+    // The file information window is not part of this build yet.
+}
+
+bool CAudioEncDlg::IsBitRateFree(const std::string& extension) {
+    for (const char* lossless : {"wav", "flac", "ape", "au"}) {
+        if (strcasecmp(extension.c_str(), lossless) == 0) {
+            return true;
+        }
+    }
+    return false;
+}
+
+void CAudioEncDlg::ApplyProfile(Profile& profile) {
+    if (g_MediaList != nullptr) {
+        g_MediaList->ApplyProfile(profile);
+    }
+    if (g_SideBar == nullptr) {
+        return;
+    }
+    g_SideBar->SetCurrentProfile(&profile);
+    const std::vector<ParameterSet*> sets = SelectedSets();
+    g_SideBar->SetSets(sets);
+    g_SideBar->FollowSelection(sets);
+}
+
+void CAudioEncDlg::OnProfileChosen(int index) {
+    if (g_SideBar == nullptr) {
+        return;
+    }
+    Profile* profile = g_SideBar->GetProfileAt(index);
+    if (profile == nullptr) {
+        return;
+    }
+    ApplyProfile(*profile);
+    if (IsBitRateFree(profile->GetExtName())) {
+        g_SideBar->SetBitRateAllowed(false);
+    }
+}
+
+void CAudioEncDlg::OnCatalogueLoaded() {
+    if (g_SideBar == nullptr || m_check == nullptr) {
+        return;
+    }
+    const int mode = GetWorkMode();
+    if (mode == 2) {
+        for (int i = 0; i < g_SideBar->GetProfileCount(); ++i) {
+            Profile* profile = g_SideBar->GetProfileAt(i);
+            if (profile != nullptr && profile->IsSysProfile() &&
+                strcasecmp(profile->GetExtName().c_str(), "wav") == 0) {
+                g_SideBar->SelectIndex(i, true);
+                break;
+            }
+        }
+    }
+    AppConfig& config = GetAppConfig();
+    const std::string convertPath = config.GetString("last_profile_path");
+    std::string ripPath = config.GetString("lastcd_profile_path");
+    if (ripPath.empty()) {
+        ripPath = convertPath;
+    }
+    if (const int index = g_SideBar->FindProfileByPath(convertPath); index >= 0) {
+        m_check->m_profileIndex[0] = index;
+    }
+    if (const int index = g_SideBar->FindProfileByPath(ripPath); index >= 0) {
+        m_check->m_profileIndex[1] = index;
+    }
+    if (mode == 0 || mode == 1) {
+        g_SideBar->SelectIndex(m_check->m_profileIndex[static_cast<std::size_t>(mode)], false);
+    }
+}
+
+std::vector<ParameterSet*> CAudioEncDlg::SelectedSets() {
+    if (GetWorkMode() == 0 && g_MediaList != nullptr) {
+        return g_MediaList->SelectedSets();
+    }
+    return {};
+}
+
+void CAudioEncDlg::EditSets(const std::function<void()>& edit) {
+    if (GetWorkMode() == 0 && g_MediaList != nullptr) {
+        g_MediaList->EditSets(edit);
+    } else if (edit) {
+        edit();
+    }
+}
+
+void CAudioEncDlg::SetSelectedVolume(int volume, bool firstOnly) {
+    if (GetWorkMode() == 0 && g_MediaList != nullptr) {
+        g_MediaList->SetSelectedVolume(volume, firstOnly);
+    }
+}
+
+int CAudioEncDlg::RememberedProfileIndex(int mode) {
+    if (m_check == nullptr || mode < 0 || mode > 2) {
+        return 0;
+    }
+    return m_check->m_profileIndex[static_cast<std::size_t>(mode)];
+}
+
+void CAudioEncDlg::RememberProfileIndex(int mode, int index) {
+    if (m_check != nullptr && mode >= 0 && mode <= 2) {
+        m_check->m_profileIndex[static_cast<std::size_t>(mode)] = index;
+    }
+}
+
+bool CAudioEncDlg::IsConvertRunActive() {
+    return m_convert && m_convert->Driver() != nullptr && m_convert->Driver()->RunPending();
+}
+
+double CAudioEncDlg::RunDoneSeconds() {
+    return m_convert && m_convert->Driver() ? m_convert->Driver()->GetRunDoneSeconds() : 0.0;
+}
+
+double CAudioEncDlg::RunTotalSeconds() {
+    return m_convert && m_convert->Driver() ? m_convert->Driver()->GetRunTotalSeconds() : 0.0;
+}
+
+}  // namespace ac
