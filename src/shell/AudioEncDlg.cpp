@@ -2,6 +2,7 @@
 
 #include "medialist/ui/MediaListWnd.h"
 #include "medialist/ui/OutputPanelWnd.h"
+#include "panels/ProgramDialogs.h"
 #include "panels/StatusWnd.h"
 #include "platform/Paths.h"
 #include "profile/ui/SideBarWnd.h"
@@ -11,7 +12,8 @@
 #include "shell/ConvertMode.h"
 #include "shell/MenuTables.h"
 #include "shell/MessageBoxes.h"
-#include "skin/AboutDlg.h"
+#include "convert/RowParameters.h"
+#include "skin/ShutDownDlg.h"
 #include "skin/ChooseSkinDlg.h"
 #include "skin/SkinBars.h"
 #include "skin/SkinMenu.h"
@@ -26,6 +28,7 @@
 #include <wx/time.h>
 #include <wx/utils.h>
 
+#include <algorithm>
 #include <sstream>
 
 namespace ac {
@@ -488,9 +491,7 @@ void CAudioEncDlg::OnCommand(wxCommandEvent& event) {
             wxLaunchDefaultBrowser("https://velmorant.example/support");
             return;
         case cmd::kAbout: {
-            ImAboutDlg about(this);
-            about.m_imagePath = GetAppConfig().GetBaseDirectory() + "/help/velmorantabout.jpg";
-            about.ShowModal();
+            ShowAboutDialog(this, GetAppConfig().GetBaseDirectory() + "/help/velmorantabout.jpg");
             return;
         }
         default:
@@ -538,16 +539,106 @@ std::string CAudioEncDlg::DescribeState() const {
     out << "skin=" << g_Skin.GetSkinName() << "\n";
     out << "language=" << g_Language.GetLanguageName() << "\n";
     out << "corners=" << (HasFlag(wxFRAME_SHAPED) ? 1 : 0) << "\n";
+    DescribePanels(out);
     out << "firstpaint_ms=" << m_firstPaintMs << "\n";
     out << "resize_ms=" << m_lastBench << "\n";
     return out.str();
+}
+
+void CAudioEncDlg::DescribePanels(std::ostream& out) const {
+    if (g_MediaList != nullptr) {
+        std::istringstream rows(g_MediaList->DescribeRows());
+        std::string row;
+        for (int index = 0; std::getline(rows, row);) {
+            if (row.rfind("row=", 0) == 0) {
+                out << "row" << index++ << "=" << row.substr(4) << "\n";
+            }
+        }
+        int index = 0;
+        for (MediaItem* item : g_MediaList->Items()) {
+            if (ParameterSet* set = SetOf(*item)) {
+                out << "set" << index << "=";
+                for (const char* key : {"ab", "ar", "ac", "vol_factor", "acodec"}) {
+                    out << key << ":" << set->GetValue(key) << ";";
+                }
+                out << "volume:" << item->volume.load() << "\n";
+            }
+            ++index;
+        }
+    }
+    if (g_OutputPanel != nullptr) {
+        out << "outdir=" << g_OutputPanel->GetOutputDirectory() << "\n";
+    }
+    if (g_SideBar != nullptr) {
+        out << g_SideBar->DescribeState() << "\n";
+    }
+    if (g_StatusWnd != nullptr) {
+        out << g_StatusWnd->DescribeState() << "\n";
+    }
+    std::string boxes;
+    for (std::string text : ShownBoxes()) {
+        std::replace(text.begin(), text.end(), '\n', ' ');
+        boxes += text + "|";
+    }
+    out << "boxes=" << boxes << "\n";
+    bool countdown = false;
+    for (wxWindow* window : wxTopLevelWindows) {
+        if (dynamic_cast<ImShutDownDlg*>(window) != nullptr && window->IsShown()) {
+            countdown = true;
+        }
+    }
+    out << "countdown=" << (countdown ? 1 : 0) << "\n";
+    out << "running=" << (m_convert && m_convert->Driver() ? m_convert->Driver()->ProcessCount() : 0)
+        << "\n";
 }
 
 void CAudioEncDlg::RunScriptCommand(const std::string& line) {
     std::istringstream in(line);
     std::string verb;
     in >> verb;
-    if (verb == "tab") {
+    std::string rest;
+    std::getline(in >> std::ws, rest);
+    in.clear();
+    in.str(rest);
+    if (verb == "add" && g_MediaList != nullptr) {
+        g_MediaList->AddFile(rest, -1);
+    } else if (verb == "addfolder" && g_MediaList != nullptr) {
+        g_MediaList->AddFolder(rest, -1);
+    } else if (verb == "outdir" && g_OutputPanel != nullptr) {
+        g_OutputPanel->SetDirectoryText(rest);
+        g_OutputPanel->CommitDirectory();
+    } else if (verb == "answer") {
+        QueueBoxAnswer(rest == "no" ? wxNO : wxYES);
+    } else if (verb == "dialog") {
+        // Presses OK or Cancel of the modal dialog in front; the program's own dialogs keep
+        // the resource ids 1 and 2 for them.
+        const bool ok = rest == "ok";
+        for (wxWindow* window : wxTopLevelWindows) {
+            auto* dialog = dynamic_cast<wxDialog*>(window);
+            if (dialog == nullptr || !dialog->IsModal()) {
+                continue;
+            }
+            for (int id : ok ? std::initializer_list<int>{1, wxID_OK}
+                             : std::initializer_list<int>{2, wxID_CANCEL}) {
+                if (wxWindow* button = dialog->FindWindow(id)) {
+                    wxCommandEvent press(wxEVT_BUTTON, id);
+                    press.SetEventObject(button);
+                    button->GetEventHandler()->ProcessEvent(press);
+                    return;
+                }
+            }
+            dialog->EndModal(ok ? wxID_OK : wxID_CANCEL);
+            return;
+        }
+    } else if (verb == "select" && g_MediaList != nullptr) {
+        int row = -1;
+        in >> row;
+        g_MediaList->SelectOnly(row);
+    } else if (verb == "profile" && g_SideBar != nullptr) {
+        int index = 0;
+        in >> index;
+        g_SideBar->SelectIndex(index, true);
+    } else if (verb == "tab") {
         int mode = 0;
         in >> mode;
         SwitchMode(mode);

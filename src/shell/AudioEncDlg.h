@@ -10,6 +10,7 @@
 #include <wx/timer.h>
 
 #include <array>
+#include <iosfwd>
 #include <map>
 #include <memory>
 #include <string>
@@ -71,6 +72,7 @@ public:
     // One line per fact, for the window tests' hook.
     std::string DescribeState() const;
     void RunScriptCommand(const std::string& line);
+    void DescribePanels(std::ostream& out) const;
 
 private:
     enum Panel { MediaList, Creator, Output, Player, Rip, SideBar, Status, PanelCount };

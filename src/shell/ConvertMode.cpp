@@ -4,14 +4,14 @@
 #include "convert/OutputNaming.h"
 #include "convert/RowParameters.h"
 #include "medialist/ui/MediaListWnd.h"
-#include "panels/SoundPlayer.h"
+#include "panels/ProgramDialogs.h"
+#include "panels/Sound.h"
 #include "platform/Paths.h"
 #include "platform/UiQueue.h"
 #include "resources/Language.h"
 #include "shell/AppConfig.h"
 #include "shell/Check.h"
 #include "shell/MessageBoxes.h"
-#include "skin/ShutDownDlg.h"
 
 #include <wx/dirdlg.h>
 #include <wx/msgdlg.h>

@@ -1,0 +1,228 @@
+// The convert mode end to end in the real program: files added through the list panel, encoded
+// by the real ctt (or a fake tool where a run must last), checked by probing the outputs; the
+// questions, the stop paths and the after-run countdown. Runs under xvfb-run.
+
+#include "../convert/FakeTool.h"
+#include "../support/AudioFixtures.h"
+#include "../support/ProgramHarness.h"
+#include "../support/RunTool.h"
+
+#include <gtest/gtest.h>
+
+#include <cstdlib>
+#include <filesystem>
+#include <thread>
+
+namespace {
+
+using namespace std::chrono_literals;
+using ac::test::Program;
+using ac::test::State;
+
+// The rows the program reports, one "NAME|DURATION|TYPE|TARGET|STATUS|checked|selected|SOURCE"
+// text each.
+std::vector<std::vector<std::string>> Rows(const State& state) {
+    std::vector<std::vector<std::string>> rows;
+    for (int i = 0;; ++i) {
+        auto found = state.find("row" + std::to_string(i));
+        if (found == state.end()) {
+            return rows;
+        }
+        std::vector<std::string> fields;
+        std::string field;
+        std::istringstream in(found->second);
+        while (std::getline(in, field, '|')) {
+            fields.push_back(field);
+        }
+        rows.push_back(fields);
+    }
+}
+
+std::string Status(const State& state, int row) {
+    const auto rows = Rows(state);
+    return row < static_cast<int>(rows.size()) && rows[std::size_t(row)].size() > 4
+               ? rows[std::size_t(row)][4]
+               : std::string();
+}
+
+bool AllRowsAre(const State& state, const std::string& status, std::size_t count) {
+    const auto rows = Rows(state);
+    if (rows.size() != count) {
+        return false;
+    }
+    for (std::size_t i = 0; i < rows.size(); ++i) {
+        if (Status(state, static_cast<int>(i)) != status) {
+            return false;
+        }
+    }
+    return true;
+}
+
+// acprobe answers {"ok":true,...,"hours":0,"minutes":0,"seconds":3,"microseconds":12000,...}.
+double ProbedSeconds(const std::string& path) {
+    const ac::test::ToolResult probe = ac::test::RunTool(AC_BIN_DIR "/acprobe", {path});
+    if (probe.out.find("\"ok\":true") == std::string::npos) {
+        return -1.0;
+    }
+    auto number = [&](const std::string& key) {
+        const auto at = probe.out.find("\"" + key + "\":");
+        return at == std::string::npos ? 0.0 : std::atof(probe.out.c_str() + at + key.size() + 3);
+    };
+    return number("hours") * 3600 + number("minutes") * 60 + number("seconds") +
+           number("microseconds") / 1e6;
+}
+
+class ConvertWindowTest : public ::testing::Test {
+protected:
+    void SetUp() override {
+        ASSERT_NE(::getenv("DISPLAY"), nullptr) << "run under xvfb-run";
+        std::filesystem::create_directories(m_home / "in");
+        ::unsetenv("AC_CTT_PATH");
+    }
+    void TearDown() override { ::unsetenv("AC_CTT_PATH"); }
+
+    std::string Wav(const std::string& name, double seconds, std::uint32_t seed) {
+        const std::string path = m_home / ("in/" + name);
+        ac::test::WriteWav(path, ac::test::MakeNoise(std::size_t(seconds * 44100), seed));
+        return path;
+    }
+    // A tool that reports progress for about ten seconds, so that a run can be paused and
+    // stopped while it lasts; the program is pointed at it through AC_CTT_PATH.
+    void UseSlowTool() {
+        const std::string tool = ac::test::WriteScript(
+            m_home / "slow-ctt",
+            "i=0\nwhile [ $i -lt 100 ]; do echo \"|Time>>> $i\"; i=$((i+1)); sleep 0.1; done\n"
+            "exit 0\n");
+        ::setenv("AC_CTT_PATH", tool.c_str(), 1);
+    }
+    std::string PowerLog() const { return Program::Slurp(m_home / "power.txt"); }
+
+    ac::test::TempDir m_home;
+};
+
+TEST_F(ConvertWindowTest, EncodesAddedFilesAndAsksBeforeEncodingThemAgain) {
+    const std::string first = Wav("first take.wav", 3.0, 1);
+    const std::string second = Wav("second.wav", 2.0, 2);
+    Program program(m_home);
+    program.WaitShown();
+    program.Send("outdir " + (m_home / "out"));
+    program.Send("add " + first);
+    program.Send("add " + second);
+    State state = program.WaitFor([](const State& s) { return Rows(s).size() == 2; });
+    ASSERT_EQ(Rows(state).size(), 2u);
+    EXPECT_EQ(Rows(state)[0][0], "first take");
+    EXPECT_EQ(Rows(state)[0][1], "00:00:03");
+    EXPECT_EQ(Rows(state)[0][2], "wav");
+    EXPECT_EQ(Rows(state)[0][5], "1") << "a new row is checked";
+
+    program.Send("command 32776");
+    state = program.WaitFor([](const State& s) { return AllRowsAre(s, "Completed", 2); }, 60s);
+    ASSERT_TRUE(AllRowsAre(state, "Completed", 2)) << state["row0"] << " / " << state["row1"];
+    EXPECT_NEAR(ProbedSeconds(m_home / "out/first take.mp3"), 3.0, 0.1);
+    EXPECT_NEAR(ProbedSeconds(m_home / "out/second.mp3"), 2.0, 0.1);
+
+    // Encoding finished rows again asks first; No leaves them as they are.
+    program.Send("answer no");
+    program.Send("command 32776");
+    state = program.WaitFor([](const State& s) {
+        return s.count("boxes") && s.at("boxes").find("re-encode") != std::string::npos;
+    });
+    EXPECT_NE(state["boxes"].find("Do you want to re-encode them?"), std::string::npos);
+    std::this_thread::sleep_for(1s);
+    EXPECT_TRUE(AllRowsAre(program.ReadState(), "Completed", 2));
+}
+
+TEST_F(ConvertWindowTest, UnreadableFilesAndCueSheetsBecomeRows) {
+    const std::string junk = m_home / "in/not audio.mp3";
+    std::ofstream(junk) << "this is no MPEG stream";
+    const std::string album = Wav("album.wav", 9.0, 3);
+    const std::string cue = m_home / "in/album.cue";
+    std::ofstream(cue) << "TITLE \"Album\"\nFILE \"album.wav\" WAVE\n"
+                          "  TRACK 01 AUDIO\n    TITLE \"One\"\n    INDEX 01 00:00:00\n"
+                          "  TRACK 02 AUDIO\n    TITLE \"Two\"\n    INDEX 01 00:03:00\n"
+                          "  TRACK 03 AUDIO\n    TITLE \"Three\"\n    INDEX 01 00:06:00\n";
+    Program program(m_home);
+    program.WaitShown();
+    program.Send("outdir " + (m_home / "out"));
+    program.Send("add " + junk);
+    program.Send("add " + cue);
+    const State state = program.WaitFor([](const State& s) { return Rows(s).size() == 4; });
+    const auto rows = Rows(state);
+    ASSERT_EQ(rows.size(), 4u);
+    EXPECT_EQ(rows[0][4], "Unknown file");
+    EXPECT_EQ(rows[1][0], "One");
+    EXPECT_EQ(rows[3][0], "Three");
+    EXPECT_EQ(rows[1][7], cue + "|1");
+    EXPECT_EQ(rows[3][7], cue + "|3");
+
+    // The cue tracks encode to the parts of the one file they cut.
+    program.Send("command 33056");
+    program.Send("command 32776");
+    const State done = program.WaitFor(
+        [](const State& s) { return Status(s, 3) == "Completed" && Status(s, 1) == "Completed"; },
+        60s);
+    EXPECT_EQ(Status(done, 3), "Completed");
+    EXPECT_NEAR(ProbedSeconds(m_home / "out/Three.mp3"), 3.0, 0.2);
+}
+
+TEST_F(ConvertWindowTest, PauseResumesAndTheMenuStopSkipsTheAfterRunAction) {
+    UseSlowTool();
+    ac::test::WriteSettings(m_home, "afterconvert=dword:0\n");
+    const std::string a = Wav("a.wav", 1.0, 4);
+    const std::string b = Wav("b.wav", 1.0, 5);
+    Program program(m_home);
+    program.WaitShown();
+    program.Send("outdir " + (m_home / "out"));
+    program.Send("add " + a);
+    program.Send("add " + b);
+    program.WaitFor([](const State& s) { return Rows(s).size() == 2; });
+    program.Send("command 32776");
+    State state = program.WaitFor([](const State& s) { return Status(s, 0) == "Running"; });
+    ASSERT_EQ(Status(state, 0), "Running");
+    EXPECT_EQ(Status(state, 1), "Waiting") << "one child runs at a time";
+
+    program.Send("command 32777");
+    state = program.WaitFor([](const State& s) { return Status(s, 0) == "Paused"; });
+    EXPECT_EQ(Status(state, 0), "Paused");
+    program.Send("command 32776");
+    state = program.WaitFor([](const State& s) { return Status(s, 0) == "Running"; });
+    EXPECT_EQ(Status(state, 0), "Running");
+
+    program.Send("answer yes");
+    program.Send("command 32778");
+    state = program.WaitFor([](const State& s) { return Status(s, 0) == "Aborted"; });
+    EXPECT_EQ(Status(state, 0), "Aborted");
+    std::this_thread::sleep_for(2s);
+    EXPECT_EQ(program.ReadState()["countdown"], "0") << "the menu's stop forgets the run";
+    EXPECT_EQ(PowerLog(), "");
+}
+
+TEST_F(ConvertWindowTest, TheStopButtonEndsTheRunWithTheCountdownWhichCanBeCancelled) {
+    UseSlowTool();
+    ac::test::WriteSettings(m_home, "afterconvert=dword:0\n");
+    const std::string a = Wav("a.wav", 1.0, 6);
+    Program program(m_home);
+    program.WaitShown();
+    program.Send("outdir " + (m_home / "out"));
+    program.Send("add " + a);
+    program.WaitFor([](const State& s) { return Rows(s).size() == 1; });
+
+    for (const char* ending : {"cancel", "ok"}) {
+        program.Send("command 32776");
+        program.WaitFor([](const State& s) { return Status(s, 0) == "Running"; });
+        program.Send("answer yes");
+        program.Send("command 1012");
+        State state = program.WaitFor([](const State& s) { return s["countdown"] == "1"; });
+        ASSERT_EQ(state["countdown"], "1") << "the button's stop keeps the after-run step";
+        program.Send(std::string("dialog ") + ending);
+        program.WaitFor([](const State& s) { return s["countdown"] == "0"; });
+        if (std::string(ending) == "cancel") {
+            std::this_thread::sleep_for(500ms);
+            EXPECT_EQ(PowerLog(), "");
+        }
+    }
+    program.WaitFor([this](const State&) { return !PowerLog().empty(); });
+    EXPECT_EQ(PowerLog(), "poweroff\n");
+}
+
+}  // namespace
