@@ -618,8 +618,9 @@ void CAudioEncDlg::RunScriptCommand(const std::string& line) {
             if (dialog == nullptr || !dialog->IsModal()) {
                 continue;
             }
-            for (int id : ok ? std::initializer_list<int>{1, wxID_OK}
-                             : std::initializer_list<int>{2, wxID_CANCEL}) {
+            const int okIds[] = {1, wxID_OK};
+            const int cancelIds[] = {2, wxID_CANCEL};
+            for (int id : ok ? okIds : cancelIds) {
                 if (wxWindow* button = dialog->FindWindow(id)) {
                     wxCommandEvent press(wxEVT_BUTTON, id);
                     press.SetEventObject(button);
