@@ -2,12 +2,13 @@
 // by the real ctt (or a fake tool where a run must last), checked by probing the outputs; the
 // questions, the stop paths and the after-run countdown. Runs under xvfb-run.
 
-#include "../convert/FakeTool.h"
 #include "../support/AudioFixtures.h"
 #include "../support/ProgramHarness.h"
 #include "../support/RunTool.h"
 
 #include <gtest/gtest.h>
+
+#include <sys/stat.h>
 
 #include <cstdlib>
 #include <filesystem>
@@ -36,6 +37,11 @@ std::vector<std::vector<std::string>> Rows(const State& state) {
         }
         rows.push_back(fields);
     }
+}
+
+std::string Field(const State& state, const std::string& key) {
+    auto found = state.find(key);
+    return found == state.end() ? std::string() : found->second;
 }
 
 std::string Status(const State& state, int row) {
@@ -89,10 +95,12 @@ protected:
     // A tool that reports progress for about ten seconds, so that a run can be paused and
     // stopped while it lasts; the program is pointed at it through AC_CTT_PATH.
     void UseSlowTool() {
-        const std::string tool = ac::test::WriteScript(
-            m_home / "slow-ctt",
-            "i=0\nwhile [ $i -lt 100 ]; do echo \"|Time>>> $i\"; i=$((i+1)); sleep 0.1; done\n"
-            "exit 0\n");
+        const std::string tool = m_home / "slow-ctt";
+        std::ofstream(tool)
+            << "#!/bin/sh\ni=0\n"
+               "while [ $i -lt 100 ]; do echo \"|Time>>> $i\"; i=$((i+1)); sleep 0.1; done\n"
+               "exit 0\n";
+        ::chmod(tool.c_str(), 0755);
         ::setenv("AC_CTT_PATH", tool.c_str(), 1);
     }
     std::string PowerLog() const { return Program::Slurp(m_home / "power.txt"); }
@@ -212,10 +220,10 @@ TEST_F(ConvertWindowTest, TheStopButtonEndsTheRunWithTheCountdownWhichCanBeCance
         program.WaitFor([](const State& s) { return Status(s, 0) == "Running"; });
         program.Send("answer yes");
         program.Send("command 1012");
-        State state = program.WaitFor([](const State& s) { return s["countdown"] == "1"; });
+        State state = program.WaitFor([](const State& s) { return Field(s, "countdown") == "1"; });
         ASSERT_EQ(state["countdown"], "1") << "the button's stop keeps the after-run step";
         program.Send(std::string("dialog ") + ending);
-        program.WaitFor([](const State& s) { return s["countdown"] == "0"; });
+        program.WaitFor([](const State& s) { return Field(s, "countdown") == "0"; });
         if (std::string(ending) == "cancel") {
             std::this_thread::sleep_for(500ms);
             EXPECT_EQ(PowerLog(), "");
