@@ -102,7 +102,14 @@ public:
         return WaitFor([](const State& s) { return s.count("title") > 0; });
     }
 
+    // The program takes command.txt away when it has read it; a second command waits for that,
+    // or it would replace the first unread.
     void Send(const std::string& command) {
+        const auto deadline = std::chrono::steady_clock::now() + 10s;
+        while (std::filesystem::exists(m_hook + "/command.txt") &&
+               std::chrono::steady_clock::now() < deadline && Running()) {
+            std::this_thread::sleep_for(20ms);
+        }
         const std::string temp = m_hook + "/command.tmp";
         std::ofstream(temp) << command << "\n";
         std::filesystem::rename(temp, m_hook + "/command.txt");
