@@ -15,6 +15,7 @@
 #include "convert/RowParameters.h"
 #include "skin/ShutDownDlg.h"
 #include "skin/ChooseSkinDlg.h"
+#include "skin/ListCtrl.h"
 #include "skin/SkinBars.h"
 #include "skin/SkinMenu.h"
 #include "skin/UiQueueWx.h"
@@ -547,23 +548,26 @@ std::string CAudioEncDlg::DescribeState() const {
 
 void CAudioEncDlg::DescribePanels(std::ostream& out) const {
     if (g_MediaList != nullptr) {
-        std::istringstream rows(g_MediaList->DescribeRows());
-        std::string row;
-        for (int index = 0; std::getline(rows, row);) {
-            if (row.rfind("row=", 0) == 0) {
-                out << "row" << index++ << "=" << row.substr(4) << "\n";
+        // Tab-separated: a cue track's type and source hold a '|' of their own.
+        XListCtrl* list = g_MediaList->List();
+        const std::vector<MediaItem*> items = g_MediaList->Items();
+        for (int row = 0; row < list->GetItemCount() && row < static_cast<int>(items.size());
+             ++row) {
+            MediaItem& item = *items[std::size_t(row)];
+            out << "row" << row << "=";
+            for (int column = 1; column <= 5; ++column) {
+                out << list->GetItemText(row, column) << "\t";
             }
-        }
-        int index = 0;
-        for (MediaItem* item : g_MediaList->Items()) {
-            if (ParameterSet* set = SetOf(*item)) {
-                out << "set" << index << "=";
+            out << (list->GetCheckbox(row, 0) == 1 ? 1 : 0) << "\t"
+                << (list->IsSelected(row) ? 1 : 0) << "\t" << item.sourcePath << "\t"
+                << static_cast<int>(item.Status()) << "\n";
+            if (ParameterSet* set = SetOf(item)) {
+                out << "set" << row << "=";
                 for (const char* key : {"ab", "ar", "ac", "vol_factor", "acodec"}) {
                     out << key << ":" << set->GetValue(key) << ";";
                 }
-                out << "volume:" << item->volume.load() << "\n";
+                out << "volume:" << item.volume.load() << "\n";
             }
-            ++index;
         }
     }
     if (g_OutputPanel != nullptr) {

@@ -20,8 +20,8 @@ using namespace std::chrono_literals;
 using ac::test::Program;
 using ac::test::State;
 
-// The rows the program reports, one "NAME|DURATION|TYPE|TARGET|STATUS|checked|selected|SOURCE"
-// text each.
+// The rows the program reports: name, duration, type, target, status text, checked, selected,
+// source and status number, separated by tabs.
 std::vector<std::vector<std::string>> Rows(const State& state) {
     std::vector<std::vector<std::string>> rows;
     for (int i = 0;; ++i) {
@@ -32,7 +32,7 @@ std::vector<std::vector<std::string>> Rows(const State& state) {
         std::vector<std::string> fields;
         std::string field;
         std::istringstream in(found->second);
-        while (std::getline(in, field, '|')) {
+        while (std::getline(in, field, '\t')) {
             fields.push_back(field);
         }
         rows.push_back(fields);
@@ -44,14 +44,17 @@ std::string Field(const State& state, const std::string& key) {
     return found == state.end() ? std::string() : found->second;
 }
 
-std::string Status(const State& state, int row) {
+enum Job { kIdle = 0, kRunning = 1, kWaiting = 2, kPaused = 3, kPending = 4, kCompleted = 5,
+           kAborted = 6, kUnknownFile = 7 };
+
+int Status(const State& state, int row) {
     const auto rows = Rows(state);
-    return row < static_cast<int>(rows.size()) && rows[std::size_t(row)].size() > 4
-               ? rows[std::size_t(row)][4]
-               : std::string();
+    return row < static_cast<int>(rows.size()) && rows[std::size_t(row)].size() > 8
+               ? std::atoi(rows[std::size_t(row)][8].c_str())
+               : -2;
 }
 
-bool AllRowsAre(const State& state, const std::string& status, std::size_t count) {
+bool AllRowsAre(const State& state, int status, std::size_t count) {
     const auto rows = Rows(state);
     if (rows.size() != count) {
         return false;
@@ -124,8 +127,8 @@ TEST_F(ConvertWindowTest, EncodesAddedFilesAndAsksBeforeEncodingThemAgain) {
     EXPECT_EQ(Rows(state)[0][5], "1") << "a new row is checked";
 
     program.Send("command 32776");
-    state = program.WaitFor([](const State& s) { return AllRowsAre(s, "Completed", 2); }, 60s);
-    ASSERT_TRUE(AllRowsAre(state, "Completed", 2)) << state["row0"] << " / " << state["row1"];
+    state = program.WaitFor([](const State& s) { return AllRowsAre(s, kCompleted, 2); }, 60s);
+    ASSERT_TRUE(AllRowsAre(state, kCompleted, 2)) << state["row0"] << " / " << state["row1"];
     EXPECT_NEAR(ProbedSeconds(m_home / "out/first take.mp3"), 3.0, 0.1);
     EXPECT_NEAR(ProbedSeconds(m_home / "out/second.mp3"), 2.0, 0.1);
 
@@ -137,7 +140,7 @@ TEST_F(ConvertWindowTest, EncodesAddedFilesAndAsksBeforeEncodingThemAgain) {
     });
     EXPECT_NE(state["boxes"].find("Do you want to re-encode them?"), std::string::npos);
     std::this_thread::sleep_for(1s);
-    EXPECT_TRUE(AllRowsAre(program.ReadState(), "Completed", 2));
+    EXPECT_TRUE(AllRowsAre(program.ReadState(), kCompleted, 2));
 }
 
 TEST_F(ConvertWindowTest, UnreadableFilesAndCueSheetsBecomeRows) {
@@ -158,6 +161,8 @@ TEST_F(ConvertWindowTest, UnreadableFilesAndCueSheetsBecomeRows) {
     const auto rows = Rows(state);
     ASSERT_EQ(rows.size(), 4u);
     EXPECT_EQ(rows[0][4], "Unknown file");
+    EXPECT_EQ(Status(state, 0), kUnknownFile);
+    EXPECT_EQ(rows[1][2], "cue|1");
     EXPECT_EQ(rows[1][0], "One");
     EXPECT_EQ(rows[3][0], "Three");
     EXPECT_EQ(rows[1][7], cue + "|1");
@@ -167,9 +172,9 @@ TEST_F(ConvertWindowTest, UnreadableFilesAndCueSheetsBecomeRows) {
     program.Send("command 33056");
     program.Send("command 32776");
     const State done = program.WaitFor(
-        [](const State& s) { return Status(s, 3) == "Completed" && Status(s, 1) == "Completed"; },
+        [](const State& s) { return Status(s, 3) == kCompleted && Status(s, 1) == kCompleted; },
         60s);
-    EXPECT_EQ(Status(done, 3), "Completed");
+    EXPECT_EQ(Status(done, 3), kCompleted);
     EXPECT_NEAR(ProbedSeconds(m_home / "out/Three.mp3"), 3.0, 0.2);
 }
 
@@ -185,21 +190,21 @@ TEST_F(ConvertWindowTest, PauseResumesAndTheMenuStopSkipsTheAfterRunAction) {
     program.Send("add " + b);
     program.WaitFor([](const State& s) { return Rows(s).size() == 2; });
     program.Send("command 32776");
-    State state = program.WaitFor([](const State& s) { return Status(s, 0) == "Running"; });
-    ASSERT_EQ(Status(state, 0), "Running");
-    EXPECT_EQ(Status(state, 1), "Waiting") << "one child runs at a time";
+    State state = program.WaitFor([](const State& s) { return Status(s, 0) == kRunning; });
+    ASSERT_EQ(Status(state, 0), kRunning);
+    EXPECT_EQ(Status(state, 1), kWaiting) << "one child runs at a time";
 
     program.Send("command 32777");
-    state = program.WaitFor([](const State& s) { return Status(s, 0) == "Paused"; });
-    EXPECT_EQ(Status(state, 0), "Paused");
+    state = program.WaitFor([](const State& s) { return Status(s, 0) == kPaused; });
+    EXPECT_EQ(Status(state, 0), kPaused);
     program.Send("command 32776");
-    state = program.WaitFor([](const State& s) { return Status(s, 0) == "Running"; });
-    EXPECT_EQ(Status(state, 0), "Running");
+    state = program.WaitFor([](const State& s) { return Status(s, 0) == kRunning; });
+    EXPECT_EQ(Status(state, 0), kRunning);
 
     program.Send("answer yes");
     program.Send("command 32778");
-    state = program.WaitFor([](const State& s) { return Status(s, 0) == "Aborted"; });
-    EXPECT_EQ(Status(state, 0), "Aborted");
+    state = program.WaitFor([](const State& s) { return Status(s, 0) == kAborted; });
+    EXPECT_EQ(Status(state, 0), kAborted);
     std::this_thread::sleep_for(2s);
     EXPECT_EQ(program.ReadState()["countdown"], "0") << "the menu's stop forgets the run";
     EXPECT_EQ(PowerLog(), "");
@@ -217,7 +222,7 @@ TEST_F(ConvertWindowTest, TheStopButtonEndsTheRunWithTheCountdownWhichCanBeCance
 
     for (const char* ending : {"cancel", "ok"}) {
         program.Send("command 32776");
-        program.WaitFor([](const State& s) { return Status(s, 0) == "Running"; });
+        program.WaitFor([](const State& s) { return Status(s, 0) == kRunning; });
         program.Send("answer yes");
         program.Send("command 1012");
         State state = program.WaitFor([](const State& s) { return Field(s, "countdown") == "1"; });
