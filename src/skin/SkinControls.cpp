@@ -7,6 +7,10 @@
 
 namespace ac {
 
+namespace {
+constexpr int kIconTextGap = 4;
+}  // namespace
+
 ImButton::ImButton(wxWindow* parent, int id, const wxString& text)
     : wxWindow(parent, id, wxDefaultPosition, wxSize(60, 24), wxBORDER_NONE) {
     SetBackgroundStyle(wxBG_STYLE_PAINT);
@@ -39,6 +43,18 @@ void ImButton::SetLabel(const wxString& label) {
     Refresh(false);
 }
 
+wxSize ImButton::FitSize() const {
+    const wxSize cell = CellSize();
+    if (!m_bText || GetLabel().empty() || cell.y <= 0) {
+        return cell;
+    }
+    const int textWidth = GetTextExtent(GetLabel()).x;
+    if (IsIconFace()) {
+        return {cell.x + kIconTextGap + textWidth + kIconTextGap, cell.y};
+    }
+    return {std::max(cell.x, textWidth + 2 * std::max(8, m_textOffset.x)), cell.y};
+}
+
 bool ImButton::Enable(bool enable) {
     m_bHover = false;
     m_bPushed = false;
@@ -62,7 +78,12 @@ void ImButton::OnPaint(wxPaintEvent& /*event*/) {
         cell = 0;
     }
     const int ch = CellHeight();
-    if (ch > 0) {
+    const bool iconBeside = IsIconFace() && size.x > m_picture.Width() && m_bText &&
+                            !GetLabel().empty();
+    if (ch > 0 && iconBeside) {
+        DrawPictureCell(dc, 0, (size.y - ch) / 2, m_picture,
+                        wxRect(0, cell * ch, m_picture.Width(), ch));
+    } else if (ch > 0) {
         DrawWidenedCell(dc, 0, 0, size.x, m_picture, wxRect(0, cell * ch, m_picture.Width(), ch));
     }
     if (m_bText) {
@@ -75,12 +96,17 @@ void ImButton::OnPaint(wxPaintEvent& /*event*/) {
         if (m_textOffset == wxPoint(0, 0)) {
             textRect = wxRect(size);
         }
+        if (iconBeside) {
+            const int left = m_picture.Width() + kIconTextGap;
+            textRect = wxRect(left, 0, size.x - left, size.y);
+        }
         // A translation longer than the face starts at the text position instead of spilling
         // over the picture's left part.
         const bool fits = dc.GetTextExtent(GetLabel()).x <= textRect.width;
         wxDCClipper clip(dc, textRect);
         dc.DrawLabel(GetLabel(), textRect,
-                     fits ? wxALIGN_CENTER : (wxALIGN_LEFT | wxALIGN_CENTER_VERTICAL));
+                     fits && !iconBeside ? wxALIGN_CENTER
+                                         : (wxALIGN_LEFT | wxALIGN_CENTER_VERTICAL));
     }
 }
 

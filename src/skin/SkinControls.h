@@ -30,6 +30,10 @@ public:
     // The cell height of the picture, 0 without one.
     int CellHeight() const { return m_picture.Height() / 4; }
     wxSize CellSize() const { return {m_picture.Width(), CellHeight()}; }
+    // The size that shows the picture and the whole label: an icon (a face no wider than twice
+    // its height) gets its label beside it; a wide face grows to hold a longer label.
+    wxSize FitSize() const;
+    bool IsIconFace() const { return CellHeight() > 0 && m_picture.Width() <= 2 * CellHeight(); }
 
 private:
     void OnPaint(wxPaintEvent& event);
