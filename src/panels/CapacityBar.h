@@ -36,6 +36,10 @@ public:
     void SetColours(const wxColour& text, const wxColour& trickText, const wxColour& trickPen);
     void SetBarFont(const wxFont& font);
 
+    // The background's height, or the bar's own without one.
+    int PictureHeight() const {
+        return m_background.IsOk() ? m_background.Height() : GetSize().y;
+    }
     long long Position() const { return m_state.position; }
     const wxString& Text() const { return m_text; }
     const wxString& UnitText() const { return m_unitText; }

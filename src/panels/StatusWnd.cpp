@@ -128,7 +128,7 @@ void CStatusWnd::OnModeChanged(int mode) {
 }
 
 int CStatusWnd::GetNeededHeight() const {
-    const int tallest = std::max(m_bar->GetSize().y, m_logButton->CellHeight());
+    const int tallest = std::max(m_bar->PictureHeight(), m_logButton->CellHeight());
     return m_metrics.TopMargin + m_metrics.BottomMargin + tallest;
 }
 
@@ -216,17 +216,12 @@ void CStatusWnd::RecalcLayout() {
         return;
     }
     const wxSize client = GetClientSize();
-    const SkinRect area{m_metrics.LeftMargin, m_metrics.TopMargin,
-                        client.x - m_metrics.LeftMargin - m_metrics.RightMargin,
-                        client.y - m_metrics.TopMargin - m_metrics.BottomMargin};
-    const wxSize button = m_logButton->CellSize();
-    const auto rects = LayoutRowRects(area, 0, m_metrics.HSpacing, {0, button.x}, 0);
-    // Each keeps its own height, centred in the strip.
-    auto place = [&](wxWindow* window, const SkinRect& rect, int height) {
-        window->SetSize(rect.x, rect.y + (rect.h - height) / 2, std::max(0, rect.w), height);
-    };
-    place(m_bar, rects[0], m_bar->GetSize().y);
-    place(m_logButton, rects[1], button.y);
+    const wxRect area(m_metrics.LeftMargin, m_metrics.TopMargin,
+                      std::max(0, client.x - m_metrics.LeftMargin - m_metrics.RightMargin),
+                      std::max(0, client.y - m_metrics.TopMargin - m_metrics.BottomMargin));
+    m_logButton->SetSize(m_logButton->CellSize());
+    // Both take the strip's height: the bar's text stands below its picture's top edge.
+    LayoutRow(area, 0, m_metrics.HSpacing, m_bar, {m_bar, m_logButton});
 }
 
 bool CStatusWnd::OnSkinChanged(const std::string& skinDir) {

@@ -109,7 +109,7 @@ void ImAboutDlg::InitDialog() {
         FindWindow(kIconId)->Hide();
         FindWindow(kFrameId)->Hide();
         FindWindow(kOkId)->Hide();
-        SetSize(GetSize().x - 8, GetSize().y);
+        SetClientSize(GetClientSize().x - 8, GetClientSize().y);
         PlaceLabelsOverPicture();
         SetBackgroundStyle(wxBG_STYLE_PAINT);
         Bind(wxEVT_PAINT, &ImAboutDlg::OnPaint, this);

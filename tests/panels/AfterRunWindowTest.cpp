@@ -165,6 +165,8 @@ TEST(AboutTest, VersionTextFromTheSettingOrTheFileVersion) {
 TEST(AboutTest, AMissingPictureLeavesTheLinesAtTheFoot) {
     std::string title, version, link;
     bool okShown = true;
+    int pictureWidth = 0;
+    int plainWidth = 0;
     wxPoint versionAt, linkAt;
     wxTheApp->CallAfter([&] {
         ImAboutDlg* dialog = FindOpen<ImAboutDlg>();
@@ -173,6 +175,7 @@ TEST(AboutTest, AMissingPictureLeavesTheLinesAtTheFoot) {
         version = dialog->FindWindow(ImAboutDlg::kVersionId)->GetLabel().utf8_string();
         link = dialog->FindWindow(ImAboutDlg::kLinkId)->GetLabel().utf8_string();
         okShown = dialog->FindWindow(ImAboutDlg::kOkId)->IsShown();
+        pictureWidth = dialog->GetClientSize().x;
         versionAt = dialog->FindWindow(ImAboutDlg::kVersionId)->GetPosition();
         linkAt = dialog->FindWindow(ImAboutDlg::kLinkId)->GetPosition();
         test::Screenshot(dialog, "about_missing_picture");
@@ -187,14 +190,16 @@ TEST(AboutTest, AMissingPictureLeavesTheLinesAtTheFoot) {
     EXPECT_EQ(linkAt.x, 10);
     EXPECT_GT(linkAt.y, versionAt.y);
 
-    wxTheApp->CallAfter([] {
+    wxTheApp->CallAfter([&plainWidth] {
         ImAboutDlg* dialog = FindOpen<ImAboutDlg>();
         ASSERT_NE(dialog, nullptr);
         EXPECT_TRUE(dialog->FindWindow(ImAboutDlg::kOkId)->IsShown());
+        plainWidth = dialog->GetClientSize().x;
         test::Screenshot(dialog, "about_plain");
         dialog->EndModal(1);
     });
     ShowAboutDialog(nullptr, "");
+    EXPECT_EQ(pictureWidth, plainWidth - 8) << "a picture makes the window 8 pixels narrower";
 }
 
 }  // namespace

@@ -9,10 +9,9 @@
 #include "skin/UiQueueWx.h"
 
 #include <wx/app.h>
-#include <wx/dcmemory.h>
-#include <wx/dcscreen.h>
 #include <wx/image.h>
 #include <wx/init.h>
+#include <wx/utils.h>
 #include <wx/window.h>
 
 #include <gtest/gtest.h>
@@ -68,16 +67,21 @@ inline void Screenshot(wxWindow* window, const std::string& name) {
     if (dir == nullptr || window == nullptr) {
         return;
     }
+    window->Raise();
     window->Refresh();
     window->Update();
-    Pump(50);
+    // Only for a person's eyes: give the X server time to map and paint.
+    for (int i = 0; i < 10; ++i) {
+        Pump(10);
+        wxMilliSleep(30);
+    }
     const wxRect rect = window->GetScreenRect();
-    wxBitmap bitmap(rect.width, rect.height);
-    wxMemoryDC memory(bitmap);
-    wxScreenDC screen;
-    memory.Blit(0, 0, rect.width, rect.height, &screen, rect.x, rect.y);
-    memory.SelectObject(wxNullBitmap);
-    bitmap.SaveFile(std::string(dir) + "/" + name + ".png", wxBITMAP_TYPE_PNG);
+    const std::string command = "import -window root -crop " + std::to_string(rect.width) + "x" +
+                                std::to_string(rect.height) + "+" + std::to_string(rect.x) +
+                                "+" + std::to_string(rect.y) + " '" + dir + "/" + name + ".png'";
+    if (std::system(command.c_str()) != 0) {
+        ADD_FAILURE() << "screenshot failed: " << command;
+    }
 }
 
 }  // namespace ac::test
