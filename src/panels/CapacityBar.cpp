@@ -38,9 +38,13 @@ void CapacityBar::SetText(const wxString& text) {
     Refresh(false);
 }
 
-void CapacityBar::SetUnitText(const wxString& text) { m_unitText = text; }
+void CapacityBar::SetUnitText(const wxString& text) {
+    m_unitText = text;
+}
 
-void CapacityBar::SetTickStep(long long step) { m_tickStep = step; }
+void CapacityBar::SetTickStep(long long step) {
+    m_tickStep = step;
+}
 
 void CapacityBar::SetBackgroundPicture(SkinPicture picture, int bgMode, int hSplitter,
                                        int vSplitter) {
@@ -150,10 +154,9 @@ void CapacityBar::PaintScale(wxDC& dc) const {
     dc.SetPen(wxPen(m_trickPenColor));
     for (std::size_t i = 0; i < ticks.size(); ++i) {
         dc.DrawLine(ticks[i].x, 0, ticks[i].x, 8);
-        const wxString label =
-            i + 1 == ticks.size()
-                ? wxString::Format("%lld %s", ticks[i].value, m_unitText)
-                : wxString::Format("%lld", ticks[i].value);
+        const wxString label = i + 1 == ticks.size()
+                                   ? wxString::Format("%lld %s", ticks[i].value, m_unitText)
+                                   : wxString::Format("%lld", ticks[i].value);
         dc.DrawText(label, ticks[i].x - 5, 10);
     }
 }

@@ -37,9 +37,7 @@ public:
     void SetBarFont(const wxFont& font);
 
     // The background's height, or the bar's own without one.
-    int PictureHeight() const {
-        return m_background.IsOk() ? m_background.Height() : GetSize().y;
-    }
+    int PictureHeight() const { return m_background.IsOk() ? m_background.Height() : GetSize().y; }
     long long Position() const { return m_state.position; }
     const wxString& Text() const { return m_text; }
     const wxString& UnitText() const { return m_unitText; }

@@ -22,7 +22,9 @@ constexpr std::uint32_t kFilePath = 444;
 constexpr std::uint32_t kClearText = 0xC161;
 constexpr std::uint32_t kCloseText = 0xC162;
 
-wxString Text(std::uint32_t id) { return wxString::FromUTF8(g_Language.GetString(id)); }
+wxString Text(std::uint32_t id) {
+    return wxString::FromUTF8(g_Language.GetString(id));
+}
 
 }  // namespace
 
@@ -33,8 +35,10 @@ CFileAddErrorWnd::CFileAddErrorWnd()
       m_clear(new wxButton(this, kClearId, Text(kClearText))),
       m_close(new wxButton(this, kCloseId, Text(kCloseText))) {
     SetBackgroundColour(wxColour(240, 240, 240));
-    Bind(wxEVT_BUTTON, [this](wxCommandEvent&) { ClearList(); }, kClearId);
-    Bind(wxEVT_BUTTON, [this](wxCommandEvent&) { Hide(); }, kCloseId);
+    Bind(
+        wxEVT_BUTTON, [this](wxCommandEvent&) { ClearList(); }, kClearId);
+    Bind(
+        wxEVT_BUTTON, [this](wxCommandEvent&) { Hide(); }, kCloseId);
     Bind(wxEVT_CLOSE_WINDOW, [this](wxCloseEvent& event) {
         if (event.CanVeto()) {
             event.Veto();
@@ -69,7 +73,9 @@ void CFileAddErrorWnd::AddRefusedFile(const std::string& path, Reason reason) {
     Show();
 }
 
-void CFileAddErrorWnd::ClearList() { m_richEdit->Clear(); }
+void CFileAddErrorWnd::ClearList() {
+    m_richEdit->Clear();
+}
 
 void CFileAddErrorWnd::OnLanguageChanged() {
     SetTitle(Text(kTitle));

@@ -22,50 +22,52 @@ constexpr std::uint32_t kExitTitle = 253;
 constexpr int kCancelled = 2;
 constexpr const char* kWebsite = "https://www.velmorant.com/";
 
-wxString Text(std::uint32_t id) { return wxString::FromUTF8(g_Language.GetString(id)); }
+wxString Text(std::uint32_t id) {
+    return wxString::FromUTF8(g_Language.GetString(id));
+}
 
 void SetActionTexts(ImShutDownDlg& dialog, int action) {
     switch (action) {
-    case kActionShutDown:
-        dialog.SetShutdownTexts();
-        dialog.SetTitle(Text(kShutDownTitle));
-        break;
-    case kActionStandby:
-        dialog.SetStandbyTexts();
-        dialog.SetTitle(Text(kStandbyTitle));
-        break;
-    case kActionHibernate:
-        dialog.SetHibernateTexts();
-        dialog.SetTitle(Text(kHibernateTitle));
-        break;
-    default:
-        dialog.SetExitTexts();
-        dialog.SetTitle(Text(kExitTitle));
-        break;
+        case kActionShutDown:
+            dialog.SetShutdownTexts();
+            dialog.SetTitle(Text(kShutDownTitle));
+            break;
+        case kActionStandby:
+            dialog.SetStandbyTexts();
+            dialog.SetTitle(Text(kStandbyTitle));
+            break;
+        case kActionHibernate:
+            dialog.SetHibernateTexts();
+            dialog.SetTitle(Text(kHibernateTitle));
+            break;
+        default:
+            dialog.SetExitTexts();
+            dialog.SetTitle(Text(kExitTitle));
+            break;
     }
 }
 
 void Act(int action, wxWindow* mainWindow) {
     switch (action) {
-    case kActionShutDown:
-        platform::ShutDownSystem(true);
-        break;
-    case kActionStandby:
-        platform::SuspendSystem(true);
-        break;
-    case kActionHibernate:
-        platform::HibernateSystem(true);
-        break;
-    default:
-        if (mainWindow != nullptr) {
-            // Posted, so that the countdown's modal loop has ended when the close path runs.
-            mainWindow->CallAfter([window = wxWeakRef<wxWindow>(mainWindow)] {
-                if (window) {
-                    window->Close();
-                }
-            });
-        }
-        break;
+        case kActionShutDown:
+            platform::ShutDownSystem(true);
+            break;
+        case kActionStandby:
+            platform::SuspendSystem(true);
+            break;
+        case kActionHibernate:
+            platform::HibernateSystem(true);
+            break;
+        default:
+            if (mainWindow != nullptr) {
+                // Posted, so that the countdown's modal loop has ended when the close path runs.
+                mainWindow->CallAfter([window = wxWeakRef<wxWindow>(mainWindow)] {
+                    if (window) {
+                        window->Close();
+                    }
+                });
+            }
+            break;
     }
 }
 

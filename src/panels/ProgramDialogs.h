@@ -12,8 +12,13 @@ class wxWindow;
 namespace ac {
 
 // After-run actions, the values of the setting `afterconvert`.
-enum AfterRunAction { kActionShutDown = 0, kActionStandby = 1, kActionHibernate = 2,
-                      kActionExit = 3, kActionNone = 4 };
+enum AfterRunAction {
+    kActionShutDown = 0,
+    kActionStandby = 1,
+    kActionHibernate = 2,
+    kActionExit = 3,
+    kActionNone = 4
+};
 
 // Plays the sound of the settings `playsound` and `last_wavopenpath` (empty: wav/hint1.wav of
 // the program), if asked, without waiting.

@@ -46,6 +46,8 @@ void AppendRun(wxTextCtrl& edit, const std::string& text, const RunStyle& style)
     edit.ShowPosition(edit.GetLastPosition());
 }
 
-std::string RichEditText(const wxTextCtrl& edit) { return edit.GetValue().utf8_string(); }
+std::string RichEditText(const wxTextCtrl& edit) {
+    return edit.GetValue().utf8_string();
+}
 
 }  // namespace ac

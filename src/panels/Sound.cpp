@@ -134,8 +134,12 @@ void PlaySoundAsync(const std::string& path) {
     Player().Start(path);
 }
 
-void WaitForSounds() { Player().Wait(); }
+void WaitForSounds() {
+    Player().Wait();
+}
 
-void StopSounds() { Player().Stop(); }
+void StopSounds() {
+    Player().Stop();
+}
 
 }  // namespace ac

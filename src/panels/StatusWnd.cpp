@@ -72,8 +72,10 @@ CStatusWnd::CStatusWnd(wxWindow* parent)
     m_bar->Show();
     m_logWnd = new CLogWnd(this);
     m_logButton->SetTextShown(false);
-    Bind(wxEVT_BUTTON, [this](wxCommandEvent&) { ShowLog(); }, kLogButtonId);
-    Bind(wxEVT_TIMER, [this](wxTimerEvent&) { OnStatusTimer(); }, kTimerId);
+    Bind(
+        wxEVT_BUTTON, [this](wxCommandEvent&) { ShowLog(); }, kLogButtonId);
+    Bind(
+        wxEVT_TIMER, [this](wxTimerEvent&) { OnStatusTimer(); }, kTimerId);
     m_timer.Start(1000);
     g_StatusWnd = this;
     TranslateWindow(*this, kDialogId);
@@ -138,8 +140,8 @@ std::string CStatusWnd::DescribeState() const {
         log = RichEditText(*control);
     }
     std::replace(log.begin(), log.end(), '\n', '|');
-    return "statustext=" + m_bar->Text().utf8_string() + "\nprogress=" +
-           std::to_string(m_bar->Position()) + "\nlog=" + log + "\n";
+    return "statustext=" + m_bar->Text().utf8_string() +
+           "\nprogress=" + std::to_string(m_bar->Position()) + "\nlog=" + log + "\n";
 }
 
 void CStatusWnd::OnStatusTimer() {
@@ -148,26 +150,26 @@ void CStatusWnd::OnStatusTimer() {
         return;
     }
     switch (hub->WorkMode()) {
-    case 0:
-        if (!hub->IsConvertRunActive()) {
+        case 0:
+            if (!hub->IsConvertRunActive()) {
+                m_bar->SetPosition(0);
+                m_bar->SetText(wxEmptyString);
+            } else {
+                m_bar->SetPosition(Percent(hub->RunDoneSeconds(), hub->RunTotalSeconds()));
+            }
+            break;
+        case 1:
+            // FIXME: the rip panel's run counters are not on the hub yet; until they are, the rip
+            // bar reads as a rip that is not running (RipPercent does the arithmetic).
             m_bar->SetPosition(0);
-            m_bar->SetText(wxEmptyString);
-        } else {
-            m_bar->SetPosition(Percent(hub->RunDoneSeconds(), hub->RunTotalSeconds()));
-        }
-        break;
-    case 1:
-        // FIXME: the rip panel's run counters are not on the hub yet; until they are, the rip
-        // bar reads as a rip that is not running (RipPercent does the arithmetic).
-        m_bar->SetPosition(0);
-        break;
-    case 2:
-        break;  // the creator panel moves the gauge itself
-    default:
-        wxMessageBox(wxString::FromUTF8(g_Language.GetString(kBadWorkMode)),
-                     wxString::FromUTF8(GetAppConfig().GetProductStrings().productName),
-                     wxOK | wxICON_ERROR, this);
-        break;
+            break;
+        case 2:
+            break;  // the creator panel moves the gauge itself
+        default:
+            wxMessageBox(wxString::FromUTF8(g_Language.GetString(kBadWorkMode)),
+                         wxString::FromUTF8(GetAppConfig().GetProductStrings().productName),
+                         wxOK | wxICON_ERROR, this);
+            break;
     }
 }
 
@@ -203,10 +205,8 @@ void CStatusWnd::AppendOnUi(const std::string& text, LogLineKind kind) {
 
 void CStatusWnd::OnLanguageChanged() {
     TranslateWindow(*this, kDialogId);
-    if (HasCapacityMarks(m_bar->State())) {
-        m_bar->SetUnitText(wxString::FromUTF8(g_Language.GetString(kMinuteText)));
-        m_bar->Refresh(false);
-    }
+    m_bar->SetUnitText(wxString::FromUTF8(g_Language.GetString(kMinuteText)));
+    m_bar->Refresh(false);
     m_logWnd->OnLanguageChanged();
 }
 

@@ -53,8 +53,14 @@ bool RunSystemctl(const char* action, bool force) {
 
 }  // namespace
 
-bool ShutDownSystem(bool force) { return RunSystemctl("poweroff", force); }
-bool SuspendSystem(bool force) { return RunSystemctl("suspend", force); }
-bool HibernateSystem(bool force) { return RunSystemctl("hibernate", force); }
+bool ShutDownSystem(bool force) {
+    return RunSystemctl("poweroff", force);
+}
+bool SuspendSystem(bool force) {
+    return RunSystemctl("suspend", force);
+}
+bool HibernateSystem(bool force) {
+    return RunSystemctl("hibernate", force);
+}
 
 }  // namespace ac::platform

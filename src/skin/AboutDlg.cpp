@@ -25,7 +25,9 @@ constexpr std::uint32_t kFileVersionLine = 0xC165;
 constexpr std::uint32_t kLegalNotice = 0xC166;
 constexpr int kPictureAttempts = 5;
 
-wxString Utf8(const std::string& text) { return wxString::FromUTF8(text); }
+wxString Utf8(const std::string& text) {
+    return wxString::FromUTF8(text);
+}
 
 bool EndsWithPng(const std::string& path) {
     if (path.size() < 3) {
@@ -78,7 +80,8 @@ ImAboutDlg::ImAboutDlg(wxWindow* parent, AboutInfo info)
     link->SetPosition(ConvertDialogToPixels(wxPoint(50, 58)));
     new wxButton(this, kOkId, Utf8(g_Language.GetString(kOkId)),
                  ConvertDialogToPixels(wxPoint(120, 120)), ConvertDialogToPixels(wxSize(50, 14)));
-    Bind(wxEVT_BUTTON, [this](wxCommandEvent&) { EndModal(kOkId); }, kOkId);
+    Bind(
+        wxEVT_BUTTON, [this](wxCommandEvent&) { EndModal(kOkId); }, kOkId);
     Bind(wxEVT_CHAR_HOOK, [this](wxKeyEvent& event) {
         const int key = event.GetKeyCode();
         if (key == WXK_ESCAPE || key == WXK_RETURN || key == WXK_NUMPAD_ENTER) {
@@ -98,13 +101,12 @@ void ImAboutDlg::InitDialog() {
     const std::string version = AboutVersionText(m_info.versionSetting, m_info.fileVersion);
     FindWindow(kLegalId)->SetLabel(
         Utf8(FormatText(g_Language.GetString(kLegalNotice), {m_info.companyFullName})));
-    FindWindow(kVersionId)->SetLabel(
-        Utf8(FormatText(g_Language.GetString(kVersionLine), {version})));
+    FindWindow(kVersionId)
+        ->SetLabel(Utf8(FormatText(g_Language.GetString(kVersionLine), {version})));
     auto* link = static_cast<ImHyperLink*>(FindWindow(kLinkId));
     link->SetURL(Utf8(m_info.website));
     link->SetLabel(Utf8(m_info.companyFullName));
-    ImDialog::SetTitle(
-        Utf8(FormatText(g_Language.GetString(kAboutTitle), {m_info.productName})));
+    ImDialog::SetTitle(Utf8(FormatText(g_Language.GetString(kAboutTitle), {m_info.productName})));
     if (!m_imagePath.empty()) {
         FindWindow(kIconId)->Hide();
         FindWindow(kFrameId)->Hide();

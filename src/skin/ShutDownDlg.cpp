@@ -32,7 +32,9 @@ int s_privilegesMade = 0;
 int s_privilegesAlive = 0;
 int s_testTickMs = 0;
 
-wxString Text(std::uint32_t id) { return wxString::FromUTF8(g_Language.GetString(id)); }
+wxString Text(std::uint32_t id) {
+    return wxString::FromUTF8(g_Language.GetString(id));
+}
 
 // ImLabel keeps lines as given: break the message at blanks to the label's width.
 wxString WrapToWidth(const wxWindow& window, const wxString& text, int width) {
@@ -59,23 +61,29 @@ ImShutdownPrivilege::ImShutdownPrivilege() {
     ++s_privilegesAlive;
 }
 
-ImShutdownPrivilege::~ImShutdownPrivilege() { --s_privilegesAlive; }
+ImShutdownPrivilege::~ImShutdownPrivilege() {
+    --s_privilegesAlive;
+}
 
-int ImShutdownPrivilege::Made() { return s_privilegesMade; }
-int ImShutdownPrivilege::Alive() { return s_privilegesAlive; }
+int ImShutdownPrivilege::Made() {
+    return s_privilegesMade;
+}
+int ImShutdownPrivilege::Alive() {
+    return s_privilegesAlive;
+}
 
 ImShutDownDlg::ImShutDownDlg(wxWindow* parent)
     : ImDialog(parent, kDialogId, Text(kShutDownTitle)),
       m_bgColor(NativeColour(kBackground)),
       m_timer(this, 1) {
     SetClientSize(ConvertDialogToPixels(wxSize(200, 140)));
-    auto* frame = new wxStaticBox(this, wxID_ANY, wxEmptyString,
-                                  ConvertDialogToPixels(wxPoint(7, 5)),
-                                  ConvertDialogToPixels(wxSize(186, 66)));
+    auto* frame =
+        new wxStaticBox(this, wxID_ANY, wxEmptyString, ConvertDialogToPixels(wxPoint(7, 5)),
+                        ConvertDialogToPixels(wxSize(186, 66)));
     frame->SetBackgroundColour(m_bgColor);
     m_messageLabel = new ImLabel(this, kMessageId, wxEmptyString);
-    m_messageLabel->SetSize(wxRect(ConvertDialogToPixels(wxPoint(14, 14)),
-                                   ConvertDialogToPixels(wxSize(172, 52))));
+    m_messageLabel->SetSize(
+        wxRect(ConvertDialogToPixels(wxPoint(14, 14)), ConvertDialogToPixels(wxSize(172, 52))));
     m_timeLabelLabel = new ImLabel(this, kTimeLabelId, wxEmptyString);
     m_timeLabelLabel->SetSize(
         wxRect(ConvertDialogToPixels(wxPoint(14, 78)), ConvertDialogToPixels(wxSize(172, 10))));
@@ -85,13 +93,17 @@ ImShutDownDlg::ImShutDownDlg(wxWindow* parent)
     new wxButton(this, kCancelId, Text(kCancelText), ConvertDialogToPixels(wxPoint(75, 118)),
                  ConvertDialogToPixels(wxSize(50, 14)));
     SetBackgroundColour(m_bgColor);
-    Bind(wxEVT_BUTTON, [this](wxCommandEvent&) { EndWith(kCancelId); }, kCancelId);
-    Bind(wxEVT_TIMER, [this](wxTimerEvent&) { Tick(); }, 1);
+    Bind(
+        wxEVT_BUTTON, [this](wxCommandEvent&) { EndWith(kCancelId); }, kCancelId);
+    Bind(
+        wxEVT_TIMER, [this](wxTimerEvent&) { Tick(); }, 1);
     Bind(wxEVT_CHAR_HOOK, &ImShutDownDlg::OnKey, this);
     Bind(wxEVT_CLOSE_WINDOW, [this](wxCloseEvent&) { EndWith(kCancelId); });
 }
 
-ImShutDownDlg::~ImShutDownDlg() { m_timer.Stop(); }
+ImShutDownDlg::~ImShutDownDlg() {
+    m_timer.Stop();
+}
 
 void ImShutDownDlg::SetShutdownTexts() {
     m_message = g_Language.GetString(kShutdownMessage);
@@ -125,7 +137,10 @@ void ImShutDownDlg::InitDialog() {
         return;
     }
     m_started = true;
+    // A translated caption reaches SetTitle too; the action's title set before must win.
+    const wxString title = m_title;
     ImDialog::InitDialog();
+    m_title = title;
     Start();
 }
 
@@ -166,8 +181,7 @@ void ImShutDownDlg::Tick() {
 
 wxString ImShutDownDlg::TimeText() const {
     const int seconds = m_ticks / 10;
-    return wxString::Format("%02d:%02d:%02d", seconds / 3600, (seconds % 3600) / 60,
-                            seconds % 60);
+    return wxString::Format("%02d:%02d:%02d", seconds / 3600, (seconds % 3600) / 60, seconds % 60);
 }
 
 void ImShutDownDlg::EndWith(int answer) {
@@ -187,20 +201,22 @@ void ImShutDownDlg::EndWith(int answer) {
 
 void ImShutDownDlg::OnKey(wxKeyEvent& event) {
     switch (event.GetKeyCode()) {
-    case WXK_ESCAPE:
-        EndWith(kCancelId);
-        break;
-    case WXK_RETURN:
-    case WXK_NUMPAD_ENTER:
-        EndWith(kOkAnswer);
-        break;
-    default:
-        event.Skip();
-        break;
+        case WXK_ESCAPE:
+            EndWith(kCancelId);
+            break;
+        case WXK_RETURN:
+        case WXK_NUMPAD_ENTER:
+            EndWith(kOkAnswer);
+            break;
+        default:
+            event.Skip();
+            break;
     }
 }
 
-void ImShutDownDlg::SetTickPeriodForTests(int milliseconds) { s_testTickMs = milliseconds; }
+void ImShutDownDlg::SetTickPeriodForTests(int milliseconds) {
+    s_testTickMs = milliseconds;
+}
 
 int ImShutDownDlg::TickPeriod() {
     if (s_testTickMs > 0) {

@@ -75,6 +75,8 @@ TEST_F(AfterRunTest, CountdownShowsTheTextsOfEachActionAndCancelDropsIt) {
         "This system will be hibernate. |Time before hibernate:|Hibernate|00:00:30",
         "The program will be exit. |Time before kill me:|Kill me|00:00:30",
     };
+    // No tick comes while the test looks: the time shown is the starting one.
+    ImShutDownDlg::SetTickPeriodForTests(3600 * 1000);
     for (int action = 0; action <= 3; ++action) {
         m_seen.clear();
         CancelNextCountdown();
@@ -118,7 +120,11 @@ TEST_F(AfterRunTest, NoActionShowsNothingYetTakesThePrivilege) {
 TEST_F(AfterRunTest, CancelAtTheLastTickWinsAndTheDisplayStepsBySeconds) {
     auto* dialog = new ImShutDownDlg(m_frame);
     dialog->SetShutdownTexts();
+    dialog->SetTitle("Standby");
     dialog->InitDialog();
+    EXPECT_TRUE(dialog->HasFlag(wxSTAY_ON_TOP));
+    EXPECT_EQ(dialog->GetTitle(), "Standby");
+    EXPECT_EQ(dialog->TimeText(), "00:00:30");
     dialog->Tick();
     EXPECT_EQ(dialog->TimeText(), "00:00:29") << "the first tick shows 29";
     for (int i = 0; i < 9; ++i) {

@@ -74,17 +74,17 @@ protected:
 
 TEST_F(StatusWndTest, LinesFromAReaderThreadArriveInOrderInTheirColours) {
     EXPECT_EQ(g_StatusWnd, m_panel);
-    std::thread reader([panel = static_cast<IProcessLog*>(m_panel),
-                        status = static_cast<IStatusText*>(m_panel)] {
-        panel->Clear();
-        for (int i = 0; i < 40; ++i) {
-            panel->Append("line " + std::to_string(i) + "\n", LogLineKind::Normal);
-        }
-        panel->Append("|Error>>> broken\n", LogLineKind::Error);
-        panel->Append("|Warning>>> odd\n", LogLineKind::Warning);
-        panel->Append("", LogLineKind::Error);
-        status->SetStatusText("Encoding song.flac");
-    });
+    std::thread reader(
+        [panel = static_cast<IProcessLog*>(m_panel), status = static_cast<IStatusText*>(m_panel)] {
+            panel->Clear();
+            for (int i = 0; i < 40; ++i) {
+                panel->Append("line " + std::to_string(i) + "\n", LogLineKind::Normal);
+            }
+            panel->Append("|Error>>> broken\n", LogLineKind::Error);
+            panel->Append("|Warning>>> odd\n", LogLineKind::Warning);
+            panel->Append("", LogLineKind::Error);
+            status->SetStatusText("Encoding song.flac");
+        });
     reader.join();
     ASSERT_TRUE(test::PumpUntil([&] { return State().find("odd") != std::string::npos; }));
     const std::string state = State();
@@ -245,4 +245,3 @@ TEST(FileAddErrorWndTest, BlocksOfRefusedFilesStayUntilCleared) {
 
 }  // namespace
 }  // namespace ac
-

@@ -77,8 +77,8 @@ inline void Screenshot(wxWindow* window, const std::string& name) {
     }
     const wxRect rect = window->GetScreenRect();
     const std::string command = "import -window root -crop " + std::to_string(rect.width) + "x" +
-                                std::to_string(rect.height) + "+" + std::to_string(rect.x) +
-                                "+" + std::to_string(rect.y) + " '" + dir + "/" + name + ".png'";
+                                std::to_string(rect.height) + "+" + std::to_string(rect.x) + "+" +
+                                std::to_string(rect.y) + " '" + dir + "/" + name + ".png'";
     if (std::system(command.c_str()) != 0) {
         ADD_FAILURE() << "screenshot failed: " << command;
     }
