@@ -7,6 +7,7 @@
 #include "panels/LogWnd.h"
 #include "panels/RichEdit.h"
 #include "panels/StatusWnd.h"
+#include "shell/AppConfig.h"
 #include "shell/MainHub.h"
 
 #include <wx/frame.h>
@@ -130,7 +131,8 @@ TEST_F(StatusWndTest, LogTextStaysWhenTheLogWindowIsClosedAndOpenedAgain) {
     m_panel->Append("first\n", LogLineKind::Warning);
     ASSERT_TRUE(test::PumpUntil([&] { return !control->IsEmpty(); }));
 
-    m_panel->ShowLog();
+    wxCommandEvent click(wxEVT_BUTTON, CStatusWnd::kLogButtonId);
+    m_panel->ProcessWindowEvent(click);
     CLogWnd* window = m_panel->LogWindow();
     EXPECT_TRUE(window->IsShown());
     EXPECT_EQ(control->GetParent(), window);
@@ -202,6 +204,17 @@ TEST_F(StatusWndTest, WorkModesSetTheirScales) {
     EXPECT_FALSE(HasCapacityMarks(state)) << "a plain bar after a creator run";
     EXPECT_EQ(state.high, 100);
     EXPECT_TRUE(CapacityBarScale(state, bar->TickStep()).empty());
+}
+
+TEST_F(StatusWndTest, APanelStartedInTheCreatorModeShowsTheDiscScale) {
+    GetAppConfig().SetInt("last_run_function", 2);
+    auto* creator = new CStatusWnd(m_frame);
+    GetAppConfig().SetInt("last_run_function", 0);
+    EXPECT_EQ(creator->Bar()->State().maxMark, 90);
+    EXPECT_EQ(creator->Bar()->UnitText(), "Minute");
+    EXPECT_EQ(g_StatusWnd, creator) << "the newest panel is the one published";
+    creator->Destroy();
+    EXPECT_FALSE(HasCapacityMarks(m_panel->Bar()->State()));
 }
 
 TEST_F(StatusWndTest, NeededHeightIsTheGapsAndTheTallerControl) {
