@@ -170,6 +170,7 @@ TEST_F(StatusWndTest, TimerFollowsTheConvertRunOfTheHub) {
     m_panel->OnStatusTimer();
     EXPECT_EQ(bar->Position(), 25);
     EXPECT_EQ(bar->Text(), "Encoding") << "the text stays as the tool's last line set it";
+    test::Screenshot(m_frame, "status_panel_convert");
 
     hub.total = 0.05;
     m_panel->OnStatusTimer();
