@@ -5,7 +5,6 @@
 #include "convert/RowParameters.h"
 #include "medialist/ui/MediaListWnd.h"
 #include "panels/ProgramDialogs.h"
-#include "panels/Sound.h"
 #include "platform/Paths.h"
 #include "platform/UiQueue.h"
 #include "resources/Language.h"
@@ -258,8 +257,9 @@ void CConvertMode::EnableTabStrip(bool enable) {
     }
 }
 
-void CConvertMode::PlaySound(const std::string& path) {
-    PlaySoundAsync(path);
+void CConvertMode::PlaySound(const std::string& /*path*/) {
+    // The settings name the file, and an empty one means the program's own hint sound.
+    PlayEndOfRunSound();
 }
 
 void CConvertMode::StartAfterRunAction(int action) {
