@@ -32,6 +32,13 @@ public:
     bool operator==(const PropertyIterator& other) const = default;
 
 private:
+    void LayoutBands();
+    wxRect HelpPaneRect() const;
+    void PaintHelpPane();
+    void OnGripMouse(wxMouseEvent& event);
+    // The node behind an iterator of this control's tree; null for any other.
+    PropertyNode* NodeOf(const PropertyIterator& item) const;
+
     PropertyTree* m_tree = nullptr;
     PropertyNode* m_node = nullptr;
 };
@@ -114,6 +121,13 @@ public:
     PropertyTree* Tree() const { return m_tree; }
 
 private:
+    void LayoutBands();
+    wxRect HelpPaneRect() const;
+    void PaintHelpPane();
+    void OnGripMouse(wxMouseEvent& event);
+    // The node behind an iterator of this control's tree; null for any other.
+    PropertyNode* NodeOf(const PropertyIterator& item) const;
+
     PropertyTree* m_tree = nullptr;
     // The implementation keeps the rest (editors, help pane, grip drag) out of this header.
     struct Impl;
