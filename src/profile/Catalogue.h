@@ -38,7 +38,7 @@ std::string SaveDirectory(std::string_view base);           // BASE\profile\user
 // The profile loaded first and shown before the rest: the last one of the convert or burn mode
 // (0), or of the rip mode (1), where an empty setting gives the fall-back and is stored.
 struct FirstProfileChoice {
-    std::string path;            // empty: no first profile (any other mode)
+    std::string path;              // empty: no first profile (any other mode)
     bool storeLastCdPath = false;  // `path` is the fall-back, to be stored as lastcd_profile_path
 };
 FirstProfileChoice ChooseFirstProfile(int lastRunFunction, std::string_view lastProfilePath,

@@ -42,13 +42,16 @@ int LeadingNumber(std::string_view text) {
     }
     long long number = 0;
     for (char c : text) {
-        if (c < '0' || c > '9') break;
+        if (c < '0' || c > '9')
+            break;
         number = std::min(number * 10 + (c - '0'), 0x7FFFFFFFLL);
     }
     return static_cast<int>(negative ? -number : number);
 }
 
-int BitRatePosition(std::string_view value) { return PositionIn(kBitRates, RateOrAuto(value, 192)); }
+int BitRatePosition(std::string_view value) {
+    return PositionIn(kBitRates, RateOrAuto(value, 192));
+}
 
 int SampleRatePosition(std::string_view value) {
     return PositionIn(kSampleRates, RateOrAuto(value, 44100));
@@ -59,8 +62,10 @@ int VolumePosition(std::string_view value) {
 }
 
 int ChannelsIndex(std::string_view value) {
-    if (value == "1 (Mono)") return 0;
-    if (value == "2 (Stereo)") return 1;
+    if (value == "1 (Mono)")
+        return 0;
+    if (value == "2 (Stereo)")
+        return 1;
     return -1;
 }
 
@@ -72,9 +77,13 @@ std::string SampleRateText(int position) {
     return std::to_string(kSampleRates[static_cast<std::size_t>(std::clamp(position, 0, 3))]);
 }
 
-std::string VolumeText(int position) { return std::to_string((position + 1) * 25) + "%"; }
+std::string VolumeText(int position) {
+    return std::to_string((position + 1) * 25) + "%";
+}
 
-std::string ChannelsText(int index) { return index == 0 ? "1 (Mono)" : "2 (Stereo)"; }
+std::string ChannelsText(int index) {
+    return index == 0 ? "1 (Mono)" : "2 (Stereo)";
+}
 
 std::string BitRateLabel(std::string_view value) {
     const bool automatic = EqualsNoCase(value, "auto");
@@ -90,7 +99,8 @@ std::string SampleRateLabel(std::string_view value) {
 std::string VolumeLabel(std::string_view value) {
     std::string format = g_Language.GetString(kVolumeFormat);
     // The format's lone trailing % is no conversion and prints nothing.
-    if (format.ends_with('%') && !format.ends_with("%%")) format.pop_back();
+    if (format.ends_with('%') && !format.ends_with("%%"))
+        format.pop_back();
     return FormatText(format, {g_Language.GetString(kVolumeName), value});
 }
 
@@ -110,7 +120,8 @@ void ApplySimpleValues(SetList sets, const SimpleValues& values) {
 void ApplyRipRow(SetList sets, const RipRowValues& row) {
     for (ParameterSet* set : sets) {
         std::vector<std::string> keys;
-        for (const ParameterRecord& record : set->Records()) keys.push_back(record.name);
+        for (const ParameterRecord& record : set->Records())
+            keys.push_back(record.name);
         for (const std::string& key : keys) {
             std::string value;
             if (key == "acodec") {
@@ -135,17 +146,24 @@ void ApplyRipRow(SetList sets, const RipRowValues& row) {
 
 GridCategory ParentOfKey(std::string_view key) {
     for (std::string_view crop : {"croptop", "cropbottom", "cropleft", "cropright"}) {
-        if (key == crop) return GridCategory::Crop;
+        if (key == crop)
+            return GridCategory::Crop;
     }
     for (std::string_view pad : {"padtop", "padbottom", "padleft", "padright", "padcolor"}) {
-        if (key == pad) return GridCategory::Pad;
+        if (key == pad)
+            return GridCategory::Pad;
     }
     const std::uint32_t flags = TestParameterFlags(key, 0xFFFFFFFFu);
-    if ((flags & PARAM_VIDEO) != 0 && (flags & PARAM_EXPERT) == 0) return GridCategory::Video;
-    if ((flags & PARAM_AUDIO) != 0) return GridCategory::Audio;
-    if ((flags & PARAM_GENERAL) != 0) return GridCategory::General;
-    if ((flags & PARAM_SUMMARY) != 0) return GridCategory::Summary;
-    if ((flags & PARAM_EXPERT) != 0) return GridCategory::Expert;
+    if ((flags & PARAM_VIDEO) != 0 && (flags & PARAM_EXPERT) == 0)
+        return GridCategory::Video;
+    if ((flags & PARAM_AUDIO) != 0)
+        return GridCategory::Audio;
+    if ((flags & PARAM_GENERAL) != 0)
+        return GridCategory::General;
+    if ((flags & PARAM_SUMMARY) != 0)
+        return GridCategory::Summary;
+    if ((flags & PARAM_EXPERT) != 0)
+        return GridCategory::Expert;
     return GridCategory::General;
 }
 
@@ -154,8 +172,10 @@ std::vector<GridItemPlan> PlanGridItems(SetList sets, bool ripMode, bool disable
     const auto table = ParameterTable();
     for (std::size_t row = 0; row < table.size(); ++row) {
         const ParameterDef& def = table[row];
-        if (!AllHaveKey(sets, def.key)) continue;
-        if (ripMode && (def.flags & (PARAM_GENERAL | PARAM_SUMMARY)) != 0) continue;
+        if (!AllHaveKey(sets, def.key))
+            continue;
+        if (ripMode && (def.flags & (PARAM_GENERAL | PARAM_SUMMARY)) != 0)
+            continue;
         GridItemPlan item;
         item.id = static_cast<int>(row);
         item.key = def.key;
@@ -179,6 +199,8 @@ std::uint32_t CategoryLabelId(GridCategory category) {
     return 0xC080 + 2 * static_cast<std::uint32_t>(category);
 }
 
-std::uint32_t CategoryHelpId(GridCategory category) { return CategoryLabelId(category) + 1; }
+std::uint32_t CategoryHelpId(GridCategory category) {
+    return CategoryLabelId(category) + 1;
+}
 
 }  // namespace ac

@@ -48,20 +48,21 @@ TEST(CatalogueRules, NameDialogFileNames) {
 class CatalogueFiles : public ac::test::ProfileFiles {
 protected:
     void SetUp() override {
-        WriteProfiles({{"mp3.pf", ac::test::PfText("MP3 Audio", "mp3", "mp3", kEntries,
-                                                   "IsSysProfile = yes\r\n")},
-                       {"wav.pf", ac::test::PfText("WAV", "wav", "wav", kEntries,
-                                                   "IsSysProfile = yes\r\n")},
-                       {"wma.pf", ac::test::PfText("WMA", "wma", "wma", kEntries)},
-                       {"blank.pf", ac::test::PfText("No format", "", "x", kEntries)},
-                       {"noname.pf", ac::test::PfText("", "ogg", "ogg", kEntries)}});
+        WriteProfiles(
+            {{"mp3.pf",
+              ac::test::PfText("MP3 Audio", "mp3", "mp3", kEntries, "IsSysProfile = yes\r\n")},
+             {"wav.pf", ac::test::PfText("WAV", "wav", "wav", kEntries, "IsSysProfile = yes\r\n")},
+             {"wma.pf", ac::test::PfText("WMA", "wma", "wma", kEntries)},
+             {"blank.pf", ac::test::PfText("No format", "", "x", kEntries)},
+             {"noname.pf", ac::test::PfText("", "ogg", "ogg", kEntries)}});
     }
     std::vector<std::string> LoadNames(const std::string& directory, const std::string& first) {
         std::vector<std::string> names;
         std::atomic<bool> stop{false};
-        ac::LoadProfilesOf(directory, first, [&](std::unique_ptr<ac::Profile> profile) {
-            names.push_back(profile->GetName());
-        }, stop);
+        ac::LoadProfilesOf(
+            directory, first,
+            [&](std::unique_ptr<ac::Profile> profile) { names.push_back(profile->GetName()); },
+            stop);
         return names;
     }
     std::string Base() const { return m_base; }

@@ -145,7 +145,8 @@ TEST_F(GridPlan, ReadOnlyInOneSetDisablesTheItemForAll) {
     EXPECT_FALSE(FindItem(items, "acodec")->enabled);
     EXPECT_TRUE(FindItem(items, "ab")->enabled);
     // The current profile shown without rows: everything disabled.
-    for (const auto& item : ac::PlanGridItems(Both(), false, true)) EXPECT_FALSE(item.enabled);
+    for (const auto& item : ac::PlanGridItems(Both(), false, true))
+        EXPECT_FALSE(item.enabled);
 }
 
 TEST_F(GridPlan, RipModeHidesGeneralAndSummaryKeys) {
@@ -155,7 +156,8 @@ TEST_F(GridPlan, RipModeHidesGeneralAndSummaryKeys) {
     }
     std::vector<ac::ParameterSet*> sets{&m_a};
     std::vector<std::string> keys;
-    for (const auto& item : ac::PlanGridItems(sets, true, false)) keys.push_back(item.key);
+    for (const auto& item : ac::PlanGridItems(sets, true, false))
+        keys.push_back(item.key);
     EXPECT_EQ(keys, (std::vector<std::string>{"threads", "acodec", "ab"}));
     EXPECT_EQ(ac::PlanGridItems(sets, false, false).size(), 10u);
 }

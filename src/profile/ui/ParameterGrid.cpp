@@ -18,15 +18,22 @@ constexpr GridCategory kRemovalOrder[] = {GridCategory::Video, GridCategory::Aud
                                           GridCategory::General, GridCategory::Summary,
                                           GridCategory::Expert};
 
-std::size_t Slot(GridCategory category) { return static_cast<std::size_t>(category); }
+std::size_t Slot(GridCategory category) {
+    return static_cast<std::size_t>(category);
+}
 
-std::string Text(std::uint32_t id) { return g_Language.GetString(id); }
+std::string Text(std::uint32_t id) {
+    return g_Language.GetString(id);
+}
 
 const char* EditorName(GridEditorKind kind) {
     switch (kind) {
-        case GridEditorKind::List: return "list";
-        case GridEditorKind::EditList: return "editlist";
-        case GridEditorKind::Edit: break;
+        case GridEditorKind::List:
+            return "list";
+        case GridEditorKind::EditList:
+            return "editlist";
+        case GridEditorKind::Edit:
+            break;
     }
     return "edit";
 }
@@ -50,7 +57,8 @@ bool ParameterGrid::IsSimpleKey(const std::string& key) {
 }
 
 void ParameterGrid::NotifyValue(const std::string& key, const std::string& value) {
-    if (m_valueListener && IsSimpleKey(key)) m_valueListener(key, value);
+    if (m_valueListener && IsSimpleKey(key))
+        m_valueListener(key, value);
 }
 
 PropertyIterator ParameterGrid::ParentFor(GridCategory category) {
@@ -73,9 +81,9 @@ void ParameterGrid::Rebuild() {
     m_entries.clear();
     m_categories = {};
     for (GridCategory category : kTopCategories) {
-        m_categories[Slot(category)] = AddCategory(kCategoryIds[Slot(category)],
-                                                   Text(CategoryLabelId(category)),
-                                                   Text(CategoryHelpId(category)));
+        m_categories[Slot(category)] =
+            AddCategory(kCategoryIds[Slot(category)], Text(CategoryLabelId(category)),
+                        Text(CategoryHelpId(category)));
     }
     SetExpanded(m_categories[Slot(GridCategory::Expert)], false);
 
@@ -90,7 +98,8 @@ void ParameterGrid::Rebuild() {
             AddItem(ParentFor(plan.parent), plan.id, Text(def.labelId),
                     plan.boolean ? PropertyKind::Bool : PropertyKind::Text, plan.value,
                     Text(def.helpId), EditorName(plan.editor));
-        for (const std::string& option : plan.options) AddOption(item, option);
+        for (const std::string& option : plan.options)
+            AddOption(item, option);
         m_entries.emplace_back(plan.key, item);
         NotifyValue(plan.key, plan.value);
         SetEnabled(item, plan.enabled);
@@ -105,7 +114,8 @@ void ParameterGrid::Rebuild() {
 
 void ParameterGrid::RefreshTexts() {
     for (std::size_t slot = 0; slot < m_categories.size(); ++slot) {
-        if (!m_categories[slot].IsValid()) continue;
+        if (!m_categories[slot].IsValid())
+            continue;
         const auto category = static_cast<GridCategory>(slot);
         SetLabel(m_categories[slot], Text(CategoryLabelId(category)));
         SetHelp(m_categories[slot], Text(CategoryHelpId(category)));
@@ -120,17 +130,20 @@ void ParameterGrid::RefreshTexts() {
 
 std::string ParameterGrid::Describe() const {
     std::ostringstream out;
-    for (const auto& [key, item] : m_entries) out << key << ':' << GetValueText(item) << ';';
+    for (const auto& [key, item] : m_entries)
+        out << key << ':' << GetValueText(item) << ';';
     return out.str();
 }
 
 void ParameterGrid::OnPropertyChanged(const PropertyIterator& item) {
     const std::string key(GetParameterKey(GetId(item)));
-    if (key.empty()) return;
+    if (key.empty())
+        return;
     const std::string value = GetValueText(item);
     auto write = [&] {
         SetValueOnSets(m_sets, key, value);
-        if (m_current != nullptr) m_current->SetValue(key, value);
+        if (m_current != nullptr)
+            m_current->SetValue(key, value);
     };
     IMainHub* hub = GetMainHub();
     if (hub != nullptr) {

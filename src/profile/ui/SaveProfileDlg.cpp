@@ -29,10 +29,13 @@ ProfileMessageHook& MessageHook() {
 
 }  // namespace
 
-void SetProfileMessageHook(ProfileMessageHook hook) { MessageHook() = std::move(hook); }
+void SetProfileMessageHook(ProfileMessageHook hook) {
+    MessageHook() = std::move(hook);
+}
 
 int ProfileMessageBox(wxWindow* parent, const std::string& text, long style) {
-    if (MessageHook()) return MessageHook()(text, style);
+    if (MessageHook())
+        return MessageHook()(text, style);
     return wxMessageBox(wxString::FromUTF8(text),
                         wxString::FromUTF8(GetAppConfig().GetProductStrings().productName), style,
                         parent);
@@ -53,7 +56,8 @@ CSaveProfileDlg::CSaveProfileDlg(wxWindow* parent, const std::string& name,
     TranslateWindow(*this, kSaveProfileDialogId);
     ok->SetLabel(wxString::FromUTF8(g_Language.GetString(1)));
     cancel->SetLabel(wxString::FromUTF8(g_Language.GetString(2)));
-    if (renameMode) SetTitle(wxString::FromUTF8(g_Language.GetString(kRenameTitle)));
+    if (renameMode)
+        SetTitle(wxString::FromUTF8(g_Language.GetString(kRenameTitle)));
 
     auto* buttons = new wxBoxSizer(wxHORIZONTAL);
     buttons->Add(ok, 0, wxRIGHT, 8);
@@ -77,7 +81,8 @@ bool CSaveProfileDlg::TryAccept() {
     const std::string typed = m_edit->GetValue().utf8_string();
     m_name = std::string(TrimBlanks(typed));
     // An empty name would write a file that loads as no profile.
-    if (m_name.empty()) return false;
+    if (m_name.empty())
+        return false;
     if (!m_renameMode) {
         m_filePath = ProfileFilePath(m_saveDirectory, m_name);
         if (ResourceExists(m_filePath) &&
@@ -94,7 +99,8 @@ bool CSaveProfileDlg::TryAccept() {
 }
 
 void CSaveProfileDlg::OnOk(wxCommandEvent& /*event*/) {
-    if (TryAccept()) EndModal(wxID_OK);
+    if (TryAccept())
+        EndModal(wxID_OK);
 }
 
 }  // namespace ac

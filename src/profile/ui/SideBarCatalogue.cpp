@@ -35,14 +35,18 @@ CSideBarWnd::NameDialogRunner& NameRunner() {
     return runner;
 }
 
-std::string Base() { return GetAppConfig().GetBaseDirectory(); }
+std::string Base() {
+    return GetAppConfig().GetBaseDirectory();
+}
 
 // A loaded profile on its way to the UI thread: std::function wants a copyable call.
 using ProfileBox = std::shared_ptr<std::unique_ptr<Profile>>;
 
 }  // namespace
 
-void CSideBarWnd::SetNameDialogRunner(NameDialogRunner runner) { NameRunner() = std::move(runner); }
+void CSideBarWnd::SetNameDialogRunner(NameDialogRunner runner) {
+    NameRunner() = std::move(runner);
+}
 
 // ---- Loading ----
 
@@ -52,16 +56,18 @@ void CSideBarWnd::StartCatalogueLoad() {
     if (config.GetString("last_profile_path", nullptr, "").empty()) {
         config.SetString("last_profile_path", FallbackProfilePath(base).c_str());
     }
-    const FirstProfileChoice first = ChooseFirstProfile(
-        config.GetInt("last_run_function", nullptr, 0),
-        config.GetString("last_profile_path", nullptr, ""),
-        config.GetString("lastcd_profile_path", nullptr, ""), base);
-    if (first.storeLastCdPath) config.SetString("lastcd_profile_path", first.path.c_str());
+    const FirstProfileChoice first =
+        ChooseFirstProfile(config.GetInt("last_run_function", nullptr, 0),
+                           config.GetString("last_profile_path", nullptr, ""),
+                           config.GetString("lastcd_profile_path", nullptr, ""), base);
+    if (first.storeLastCdPath)
+        config.SetString("lastcd_profile_path", first.path.c_str());
 
     std::shared_ptr<CSideBarWnd*> self = m_self;
     auto post = [self](std::function<void(CSideBarWnd&)> call) {
         UiQueue::Post([self, call = std::move(call)] {
-            if (*self != nullptr) call(**self);
+            if (*self != nullptr)
+                call(**self);
         });
     };
     auto deliver = [post](std::unique_ptr<Profile> profile) {
@@ -80,14 +86,14 @@ void CSideBarWnd::StartCatalogueLoad() {
         // User entries stand behind the first profile, which the system loader posts first.
         m_firstPosted.wait();
         auto added = std::make_shared<std::atomic<int>>(0);
-        LoadProfilesOf(UserProfileDirectory(base), first.path,
-                       [post, added](std::unique_ptr<Profile> profile) {
-                           ++*added;
-                           ProfileBox box =
-                               std::make_shared<std::unique_ptr<Profile>>(std::move(profile));
-                           post([box](CSideBarWnd& bar) { bar.AddLoadedProfile(std::move(*box)); });
-                       },
-                       m_stopLoading);
+        LoadProfilesOf(
+            UserProfileDirectory(base), first.path,
+            [post, added](std::unique_ptr<Profile> profile) {
+                ++*added;
+                ProfileBox box = std::make_shared<std::unique_ptr<Profile>>(std::move(profile));
+                post([box](CSideBarWnd& bar) { bar.AddLoadedProfile(std::move(*box)); });
+            },
+            m_stopLoading);
         const bool any = added->load() > 0;
         post([any](CSideBarWnd& bar) { bar.OnLoaderDone(any); });
     });
@@ -97,12 +103,15 @@ void CSideBarWnd::StartCatalogueLoad() {
 void CSideBarWnd::StopCatalogueLoad() {
     m_stopLoading = true;
     *m_self = nullptr;
-    if (m_systemLoader.joinable()) m_systemLoader.join();
-    if (m_userLoader.joinable()) m_userLoader.join();
+    if (m_systemLoader.joinable())
+        m_systemLoader.join();
+    if (m_userLoader.joinable())
+        m_userLoader.join();
 }
 
 void CSideBarWnd::AddLoadedProfile(std::unique_ptr<Profile> profile) {
-    if (profile == nullptr) return;
+    if (profile == nullptr)
+        return;
     const std::string text = SelectorEntryText(*profile);
     m_catalogue.Add(std::move(profile));
     m_profileSelector->Append(wxString::FromUTF8(text));
@@ -115,13 +124,16 @@ void CSideBarWnd::OnFirstProfile(std::unique_ptr<Profile> profile) {
         m_profileSelector->SetSelection(m_catalogue.IndexOf(first));
         m_grid->SetCurrentProfile(first);
     }
-    if (IMainHub* hub = GetMainHub()) hub->OnProfileChosen(0);
+    if (IMainHub* hub = GetMainHub())
+        hub->OnProfileChosen(0);
 }
 
 void CSideBarWnd::OnLoaderDone(bool adjustWidth) {
-    if (adjustWidth) AdjustDropDownWidth();
+    if (adjustWidth)
+        AdjustDropDownWidth();
     if (++m_loadersDone == 2) {
-        if (IMainHub* hub = GetMainHub()) hub->OnCatalogueLoaded();
+        if (IMainHub* hub = GetMainHub())
+            hub->OnCatalogueLoaded();
     }
 }
 
@@ -157,14 +169,20 @@ int CSideBarWnd::GetSelectedIndex() const {
 }
 
 void CSideBarWnd::SelectIndex(int index, bool runHandler) {
-    if (index < 0 || index >= m_catalogue.Count()) return;
+    if (index < 0 || index >= m_catalogue.Count())
+        return;
     m_profileSelector->SetSelection(index);
-    if (runHandler) OnProfileSelected(index);
+    if (runHandler)
+        OnProfileSelected(index);
 }
 
-Profile* CSideBarWnd::GetCurrentProfile() const { return m_grid->GetCurrentProfile(); }
+Profile* CSideBarWnd::GetCurrentProfile() const {
+    return m_grid->GetCurrentProfile();
+}
 
-void CSideBarWnd::SetCurrentProfile(Profile* profile) { m_grid->SetCurrentProfile(profile); }
+void CSideBarWnd::SetCurrentProfile(Profile* profile) {
+    m_grid->SetCurrentProfile(profile);
+}
 
 void CSideBarWnd::SetSets(const std::vector<ParameterSet*>& sets) {
     m_grid->SetSets(sets);
@@ -172,15 +190,19 @@ void CSideBarWnd::SetSets(const std::vector<ParameterSet*>& sets) {
 }
 
 void CSideBarWnd::FollowSelection(const std::vector<ParameterSet*>& sets) {
-    if (sets.empty()) return;
+    if (sets.empty())
+        return;
     const std::string name = sets.front()->GetName();
     for (const ParameterSet* set : sets) {
-        if (set->GetName() != name) return;
+        if (set->GetName() != name)
+            return;
     }
     const Profile* selected = m_catalogue.At(GetSelectedIndex());
-    if (selected != nullptr && selected->GetName() == name) return;
+    if (selected != nullptr && selected->GetName() == name)
+        return;
     const int index = m_catalogue.FindByName(name);
-    if (index >= 0) SelectIndex(index, false);
+    if (index >= 0)
+        SelectIndex(index, false);
 }
 
 void CSideBarWnd::OnProfileSelected(int index) {
@@ -204,7 +226,8 @@ void CSideBarWnd::OnProfileSelected(int index) {
 void CSideBarWnd::StoreChoice(int index) {
     const int mode = CurrentWorkMode();
     const std::string path = m_catalogue.At(index)->GetPath();
-    if (IMainHub* hub = GetMainHub()) hub->RememberProfileIndex(mode, index);
+    if (IMainHub* hub = GetMainHub())
+        hub->RememberProfileIndex(mode, index);
     if (mode == 1) {
         const std::string stored = path.empty() ? FallbackProfilePath(Base()) : path;
         GetAppConfig().SetString("lastcd_profile_path", stored.c_str());
@@ -215,31 +238,37 @@ void CSideBarWnd::StoreChoice(int index) {
 
 void CSideBarWnd::ReadProfileIntoControls() {
     const Profile* current = m_grid->GetCurrentProfile();
-    if (current == nullptr) return;
+    if (current == nullptr)
+        return;
     m_values.sampleRate = current->GetValue("ar");
     m_values.bitRate = current->GetValue("ab");
-    if (m_values.bitRate.empty()) m_values.bitRate = "Auto";
+    if (m_values.bitRate.empty())
+        m_values.bitRate = "Auto";
     m_values.channels = current->GetValue("ac");
     m_values.volume = current->GetValue("vol_factor");
     OnSimpleValueMapped("ar", m_values.sampleRate);
     OnSimpleValueMapped("ab", m_values.bitRate);
     OnSimpleValueMapped("ac", m_values.channels);
     OnSimpleValueMapped("vol_factor", m_values.volume);
-    if (CurrentWorkMode() == 1 && !m_bitRateAllowed) SetBitRateLabel("Auto");
+    if (CurrentWorkMode() == 1 && !m_bitRateAllowed)
+        SetBitRateLabel("Auto");
 }
 
 // ---- The profile menu ----
 
 void CSideBarWnd::ShowProfileMenu() {
     const Profile* selected = m_catalogue.At(GetSelectedIndex());
-    if (selected == nullptr) return;
+    if (selected == nullptr)
+        return;
     wxMenu menu;
     auto add = [&](int id) {
         menu.Append(id, wxString::FromUTF8(g_Language.GetMenuText(static_cast<std::uint32_t>(id))));
     };
     const bool system = selected->IsSysProfile();
-    if (!system) add(kCmdSave);
-    for (int id : {kCmdSaveAs, kCmdRename, kCmdDelete}) add(id);
+    if (!system)
+        add(kCmdSave);
+    for (int id : {kCmdSaveAs, kCmdRename, kCmdDelete})
+        add(id);
     menu.Enable(kCmdRename, !system);
     menu.Enable(kCmdDelete, !system);
     const wxRect button = m_saveButton->GetRect();
@@ -247,21 +276,25 @@ void CSideBarWnd::ShowProfileMenu() {
 }
 
 bool CSideBarWnd::RunNameDialog(CSaveProfileDlg& dialog) {
-    if (NameRunner()) return NameRunner()(dialog);
+    if (NameRunner())
+        return NameRunner()(dialog);
     return dialog.ShowModal() == wxID_OK;
 }
 
 void CSideBarWnd::SaveProfile(bool saveAs) {
     const int index = GetSelectedIndex();
     Profile* selected = m_catalogue.At(index);
-    if (selected == nullptr) return;
+    if (selected == nullptr)
+        return;
     const ParameterSet* working = m_grid->GetCurrentProfile();
-    if (working == nullptr) working = selected;
+    if (working == nullptr)
+        working = selected;
     CatalogueResult result = CatalogueResult::Ok;
     if (saveAs) {
         CSaveProfileDlg dialog(this, selected->GetName(), SaveDirectory(Base()), m_catalogue,
                                false);
-        if (!RunNameDialog(dialog)) return;
+        if (!RunNameDialog(dialog))
+            return;
         result = m_catalogue.SaveAs(index, *working, dialog.Name(), dialog.FilePath());
         if (result == CatalogueResult::Ok) {
             m_profileSelector->Append(
@@ -280,9 +313,11 @@ void CSideBarWnd::SaveProfile(bool saveAs) {
 void CSideBarWnd::RenameProfile() {
     const int index = GetSelectedIndex();
     Profile* selected = m_catalogue.At(index);
-    if (selected == nullptr) return;
+    if (selected == nullptr)
+        return;
     CSaveProfileDlg dialog(this, selected->GetName(), SaveDirectory(Base()), m_catalogue, true);
-    if (!RunNameDialog(dialog)) return;
+    if (!RunNameDialog(dialog))
+        return;
     int newIndex = -1;
     if (m_catalogue.Rename(index, dialog.Name(), newIndex) != CatalogueResult::Ok) {
         ProfileMessageBox(this, g_Language.GetString(kSaveFailed), wxOK | wxICON_STOP);
@@ -295,7 +330,8 @@ void CSideBarWnd::RenameProfile() {
 
 void CSideBarWnd::DeleteProfile() {
     const int index = GetSelectedIndex();
-    if (m_catalogue.At(index) == nullptr) return;
+    if (m_catalogue.At(index) == nullptr)
+        return;
     if (ProfileMessageBox(this, g_Language.GetString(kAskDelete),
                           wxYES_NO | wxNO_DEFAULT | wxICON_QUESTION) != wxYES) {
         return;
@@ -315,8 +351,9 @@ std::string CSideBarWnd::DescribeState() const {
     std::ostringstream out;
     const int selected = GetSelectedIndex();
     out << "profile="
-        << (selected >= 0 ? m_profileSelector->GetString(static_cast<unsigned>(selected)).utf8_string()
-                          : std::string())
+        << (selected >= 0
+                ? m_profileSelector->GetString(static_cast<unsigned>(selected)).utf8_string()
+                : std::string())
         << "\n";
     out << "profiles=" << m_catalogue.Count() << "\n";
     out << "grid=" << m_grid->Describe() << "\n";

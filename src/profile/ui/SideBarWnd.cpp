@@ -36,16 +36,25 @@ struct DefaultText {
     const char* text;
 };
 constexpr DefaultText kDefaultTexts[] = {
-    {kProfileLabel, "Profile:"},         {kAdvanced, "Advanced"},
-    {kSimple, "Simple"},                 {kSaveProfile, "SaveProfile"},
-    {kBitRateLabel, "Bit Rate:"},        {kSampleRateLabel, "Sample Rate:"},
-    {kVolumeLabel, "Volume:"},           {kChannelsLabel, "Channels:"},
-    {kVolumeNameLabel, "Juanbiao:"},     {kAlbumLabel, "Album:"},
-    {kArtistLabel, "Artist:"},           {kTitleLabel, "Title:"},
-    {kIntervalLabel, "Interval:"},       {kBalance, "Balance"},
+    {kProfileLabel, "Profile:"},
+    {kAdvanced, "Advanced"},
+    {kSimple, "Simple"},
+    {kSaveProfile, "SaveProfile"},
+    {kBitRateLabel, "Bit Rate:"},
+    {kSampleRateLabel, "Sample Rate:"},
+    {kVolumeLabel, "Volume:"},
+    {kChannelsLabel, "Channels:"},
+    {kVolumeNameLabel, "Juanbiao:"},
+    {kAlbumLabel, "Album:"},
+    {kArtistLabel, "Artist:"},
+    {kTitleLabel, "Title:"},
+    {kIntervalLabel, "Interval:"},
+    {kBalance, "Balance"},
 };
 
-wxString Wx(const std::string& text) { return wxString::FromUTF8(text); }
+wxString Wx(const std::string& text) {
+    return wxString::FromUTF8(text);
+}
 
 }  // namespace
 
@@ -60,9 +69,13 @@ CSideBarWnd::CSideBarWnd(wxWindow* parent)
     m_grid->SetGridLineColor(wxColour(125, 156, 197), false);
     m_grid->SetCommentHeight(GetAppConfig().GetInt("prop_comments_height", nullptr, 52));
     m_grid->SetLabelColumnWidth(GetAppConfig().GetInt("prop_second_column_width", nullptr, 90));
-    m_grid->SetValueListener(
-        [this](const std::string& key, const std::string& value) { OnSimpleValueMapped(key, value); });
+    m_grid->SetValueListener([this](const std::string& key, const std::string& value) {
+        OnSimpleValueMapped(key, value);
+    });
     OnLanguageChanged();
+    const bool burn = GetAppConfig().GetInt("last_run_function", nullptr, 0) == 2;
+    m_profileSelector->Show(!burn);
+    m_discType->Show(burn);
     m_grid->Hide();
     m_advancedButton->Enable(true);
     m_simpleButton->Enable(false);
@@ -72,7 +85,8 @@ CSideBarWnd::CSideBarWnd(wxWindow* parent)
 
 CSideBarWnd::~CSideBarWnd() {
     StopCatalogueLoad();
-    if (g_SideBar == this) g_SideBar = nullptr;
+    if (g_SideBar == this)
+        g_SideBar = nullptr;
 }
 
 void CSideBarWnd::CreateControls() {
@@ -94,8 +108,8 @@ void CSideBarWnd::CreateControls() {
     m_channels = new wxChoice(this, kChannels);
     m_volumeNameLabel = new ImLabel(this, kVolumeNameLabel, "Juanbiao:");
     m_volumeName = new wxTextCtrl(this, kVolumeName, Wx(g_Language.GetString(kNewDiscText)));
-    m_simpleGroup = {m_bitRateLabel,   m_bitRateSlider, m_sampleRateLabel, m_sampleRateSlider,
-                     m_volumeLabel,    m_volumeSlider,  m_channelsLabel,   m_channels};
+    m_simpleGroup = {m_bitRateLabel, m_bitRateSlider, m_sampleRateLabel, m_sampleRateSlider,
+                     m_volumeLabel,  m_volumeSlider,  m_channelsLabel,   m_channels};
 
     const std::pair<int, int> discRows[] = {
         {kAlbumLabel, kAlbum}, {kArtistLabel, kArtist}, {kTitleLabel, kTitle}};
@@ -107,7 +121,8 @@ void CSideBarWnd::CreateControls() {
     m_discLabels.push_back(new ImLabel(this, kIntervalLabel, "Interval:"));
     m_discGroup.push_back(m_discLabels.back());
     m_interval = new wxChoice(this, kInterval);
-    for (const char* seconds : {"0", "1", "2", "3", "5"}) m_interval->Append(seconds);
+    for (const char* seconds : {"0", "1", "2", "3", "5"})
+        m_interval->Append(seconds);
     m_interval->SetSelection(1);
     m_discGroup.push_back(m_interval);
     m_balance = new ImCheckBox(this, kBalance, "Balance");
@@ -125,17 +140,27 @@ void CSideBarWnd::CreateControls() {
 }
 
 void CSideBarWnd::BindEvents() {
-    Bind(wxEVT_BUTTON, [this](wxCommandEvent&) { OnAdvancedPressed(true); }, kAdvanced);
-    Bind(wxEVT_BUTTON, [this](wxCommandEvent&) { OnAdvancedPressed(false); }, kSimple);
-    Bind(wxEVT_BUTTON, [this](wxCommandEvent&) { ShowProfileMenu(); }, kSaveProfile);
-    Bind(wxEVT_CHOICE, [this](wxCommandEvent&) { OnProfileSelected(GetSelectedIndex()); },
-         kProfileSelector);
-    Bind(wxEVT_CHOICE, [this](wxCommandEvent&) { SelectDiscType(GetDiscType()); }, kDiscType);
-    Bind(wxEVT_CHOICE, [this](wxCommandEvent&) { OnChannelsChosen(); }, kChannels);
-    Bind(wxEVT_MENU, [this](wxCommandEvent&) { SaveProfile(false); }, kCmdSave);
-    Bind(wxEVT_MENU, [this](wxCommandEvent&) { SaveProfile(true); }, kCmdSaveAs);
-    Bind(wxEVT_MENU, [this](wxCommandEvent&) { RenameProfile(); }, kCmdRename);
-    Bind(wxEVT_MENU, [this](wxCommandEvent&) { DeleteProfile(); }, kCmdDelete);
+    Bind(
+        wxEVT_BUTTON, [this](wxCommandEvent&) { OnAdvancedPressed(true); }, kAdvanced);
+    Bind(
+        wxEVT_BUTTON, [this](wxCommandEvent&) { OnAdvancedPressed(false); }, kSimple);
+    Bind(
+        wxEVT_BUTTON, [this](wxCommandEvent&) { ShowProfileMenu(); }, kSaveProfile);
+    Bind(
+        wxEVT_CHOICE, [this](wxCommandEvent&) { OnProfileSelected(GetSelectedIndex()); },
+        kProfileSelector);
+    Bind(
+        wxEVT_CHOICE, [this](wxCommandEvent&) { SelectDiscType(GetDiscType()); }, kDiscType);
+    Bind(
+        wxEVT_CHOICE, [this](wxCommandEvent&) { OnChannelsChosen(); }, kChannels);
+    Bind(
+        wxEVT_MENU, [this](wxCommandEvent&) { SaveProfile(false); }, kCmdSave);
+    Bind(
+        wxEVT_MENU, [this](wxCommandEvent&) { SaveProfile(true); }, kCmdSaveAs);
+    Bind(
+        wxEVT_MENU, [this](wxCommandEvent&) { RenameProfile(); }, kCmdRename);
+    Bind(
+        wxEVT_MENU, [this](wxCommandEvent&) { DeleteProfile(); }, kCmdDelete);
     // A slider takes effect when the mouse lets it go, not while it moves.
     for (ImTickSlider* slider : {m_bitRateSlider, m_sampleRateSlider, m_volumeSlider}) {
         slider->Bind(wxEVT_LEFT_DOWN, [this, slider](wxMouseEvent& event) {
@@ -150,13 +175,15 @@ void CSideBarWnd::BindEvents() {
             }
         });
     }
-    Bind(wxEVT_UPDATE_UI, [this](wxUpdateUIEvent&) { UpdateEnabling(); }, kSideBarPanelId);
+    Bind(
+        wxEVT_UPDATE_UI, [this](wxUpdateUIEvent&) { UpdateEnabling(); }, kSideBarPanelId);
 }
 
 void CSideBarWnd::OnLanguageChanged() {
     // Back to the built-in words first, so a language without these texts shows English.
     for (const DefaultText& entry : kDefaultTexts) {
-        if (wxWindow* control = FindWindow(entry.id)) control->SetLabel(entry.text);
+        if (wxWindow* control = FindWindow(entry.id))
+            control->SetLabel(entry.text);
     }
     TranslateWindow(*this, m_nDialogId);
     const int channels = m_channels->GetSelection();
@@ -166,7 +193,8 @@ void CSideBarWnd::OnLanguageChanged() {
     m_channels->SetSelection(channels == wxNOT_FOUND ? kChannelsStart : channels);
     const int discType = m_discType->GetSelection();
     m_discType->Clear();
-    for (std::uint32_t id : kDiscTypeTexts) m_discType->Append(Wx(g_Language.GetString(id)));
+    for (std::uint32_t id : kDiscTypeTexts)
+        m_discType->Append(Wx(g_Language.GetString(id)));
     m_discType->SetSelection(discType == wxNOT_FOUND ? 0 : discType);
     RebuildSelectorTexts();
     SetBitRateLabel(m_bitRateShown);
@@ -175,7 +203,9 @@ void CSideBarWnd::OnLanguageChanged() {
     RefreshTexts();
 }
 
-void CSideBarWnd::RefreshTexts() { m_grid->RefreshTexts(); }
+void CSideBarWnd::RefreshTexts() {
+    m_grid->RefreshTexts();
+}
 
 void CSideBarWnd::SetBitRateLabel(const std::string& value) {
     m_bitRateShown = value;
@@ -196,9 +226,10 @@ bool CSideBarWnd::OnSkinChanged(const std::string& skinDir) {
     ImSkinPanel::OnSkinChanged(skinDir);
     const char* section = GetSkinSection();
     const wxColour panelBg = Look().childBg;
-    const wxColour propertyBg = m_skin.GetString("PropertyBgColor", "", section).empty()
-                                    ? *wxWHITE
-                                    : NativeColour(m_skin.GetRgbColour("PropertyBgColor", 0, section));
+    const wxColour propertyBg =
+        m_skin.GetString("PropertyBgColor", "", section).empty()
+            ? *wxWHITE
+            : NativeColour(m_skin.GetRgbColour("PropertyBgColor", 0, section));
     const wxColour commentBg =
         m_skin.GetString("CommentBgColor", "", section).empty()
             ? panelBg
@@ -208,15 +239,17 @@ bool CSideBarWnd::OnSkinChanged(const std::string& skinDir) {
         m_grid->SetGridLineColor(NativeColour(m_skin.GetRgbColour("GridLineColor", 0, section)),
                                  true);
     }
-    auto picture = [&](const char* key) { return LoadSkinPicture(m_skin.GetString(key, "", section)); };
+    auto picture = [&](const char* key) {
+        return LoadSkinPicture(m_skin.GetString(key, "", section));
+    };
     const wxFont titleFont = MakeSkinFont(m_skin.GetFont(section, "Title"));
     const wxFont font = MakeSkinFont(m_skin.GetFont(section));
     const wxColour titleColour = NativeColour(m_skin.GetRgbColour("TitleTextColor", 0, section));
     const wxColour textColour = NativeColour(m_skin.GetRgbColour("TextColor", 0, section));
     m_profileLabel->SetFont(titleFont);
     m_profileLabel->SetTextColour(titleColour);
-    for (ImLabel* label : {m_bitRateLabel, m_sampleRateLabel, m_channelsLabel, m_volumeLabel,
-                           m_volumeNameLabel}) {
+    for (ImLabel* label :
+         {m_bitRateLabel, m_sampleRateLabel, m_channelsLabel, m_volumeLabel, m_volumeNameLabel}) {
         label->SetFont(font);
         label->SetTextColour(textColour);
     }
@@ -224,7 +257,8 @@ bool CSideBarWnd::OnSkinChanged(const std::string& skinDir) {
         label->SetFont(font);
         label->SetTextColour(textColour);
     }
-    for (ImLabel* label : m_discLabels) label->SetBgColor(panelBg);
+    for (ImLabel* label : m_discLabels)
+        label->SetBgColor(panelBg);
     for (ImLabel* label : {m_profileLabel, m_bitRateLabel, m_sampleRateLabel, m_channelsLabel,
                            m_volumeLabel, m_volumeNameLabel}) {
         label->SetBgColor(panelBg);
@@ -241,8 +275,9 @@ bool CSideBarWnd::OnSkinChanged(const std::string& skinDir) {
     m_advancedButton->SetPicture(LoadSkinPicture("mode_nor.bmp"));
     m_simpleButton->SetPicture(LoadSkinPicture("mode_adv.bmp"));
     m_saveButton->SetPicture(LoadSkinPicture("ProfileMenu.bmp"));
-    m_saveButton->SetTextShown(m_saveButton->CellHeight() == 0);
     for (ImButton* button : {m_advancedButton, m_simpleButton, m_saveButton}) {
+        // Bitmap buttons: the picture says it, the text is only the fall-back.
+        button->SetTextShown(button->CellHeight() == 0);
         button->SetTextColours(Look().buttonText);
         button->SetFont(font);
     }
@@ -255,7 +290,8 @@ bool CSideBarWnd::OnSkinChanged(const std::string& skinDir) {
 
 void CSideBarWnd::RecalcLayout() {
     ImSkinDialog::RecalcLayout();
-    if (m_grid == nullptr) return;
+    if (m_grid == nullptr)
+        return;
     const wxSize client = GetClientSize();
     const int left = m_metrics.LeftMargin;
     const int width = std::max(40, client.x - left - m_metrics.RightMargin);
@@ -322,7 +358,8 @@ void CSideBarWnd::LayoutDiscGroup(int x, int y, int width) {
 // ---- Modes ----
 
 void CSideBarWnd::ShowGroup(const std::vector<wxWindow*>& group, bool show) {
-    for (wxWindow* window : group) window->Show(show);
+    for (wxWindow* window : group)
+        window->Show(show);
 }
 
 void CSideBarWnd::ApplyMode(bool advanced) {
@@ -408,7 +445,8 @@ void CSideBarWnd::SelectDiscType(int type) {
     }
     static const char* const kFormats[] = {"wav", "mp3", "wma"};
     const int index = m_catalogue.FindSystemByExt(kFormats[type]);
-    if (index >= 0) SelectIndex(index, true);
+    if (index >= 0)
+        SelectIndex(index, true);
 }
 
 // ---- Enabling ----
@@ -425,7 +463,8 @@ void CSideBarWnd::SetGridEditable(bool editable) {
 
 void CSideBarWnd::SetBitRateAllowed(bool allowed) {
     m_bitRateAllowed = allowed;
-    if (!allowed) SetBitRateLabel("Auto");
+    if (!allowed)
+        SetBitRateLabel("Auto");
     UpdateEnabling();
 }
 

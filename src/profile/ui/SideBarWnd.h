@@ -57,8 +57,7 @@ inline constexpr int kTitleLabel = 1209, kTitle = 1203;
 inline constexpr int kIntervalLabel = 1207, kInterval = 1208;
 inline constexpr int kBalance = 1204;
 // The profile menu: 132 for a user profile, 4 for a system one.
-inline constexpr int kCmdSave = 33201, kCmdSaveAs = 33202, kCmdRename = 33203,
-                     kCmdDelete = 33204;
+inline constexpr int kCmdSave = 33201, kCmdSaveAs = 33202, kCmdRename = 33203, kCmdDelete = 33204;
 }  // namespace sidebar
 
 class CSideBarWnd : public ImSkinPanel {

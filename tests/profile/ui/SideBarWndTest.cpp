@@ -29,7 +29,8 @@ using test::PfText;
 
 const std::vector<std::string> kEntries = {
     "title = 0, \"\", \"\"", "ab = 0, \"Auto\", \"128\", {\"64\", \"128\", \"256\"}",
-    "ar = 0, \"\", \"44100\"", "ac = 0, \"\", \"2 (Stereo)\"", "vol_factor = 0, \"100%\", \"100%\""};
+    "ar = 0, \"\", \"44100\"", "ac = 0, \"\", \"2 (Stereo)\"",
+    "vol_factor = 0, \"100%\", \"100%\""};
 
 class FakeHub : public IMainHub {
 public:
@@ -100,10 +101,11 @@ protected:
         ::setenv("XDG_CONFIG_HOME", (*shared / "config").c_str(), 1);
         std::filesystem::remove_all(*shared / "xdg");
         ClosePackage(m_base + "\\profile\\user\\x.pf");
-        WriteProfiles({{"mp3.pf", PfText("MP3 Audio", "mp3", "mp3", kEntries, "IsSysProfile = yes\r\n")},
-                       {"ogg.pf", PfText("OGG Vorbis", "ogg", "ogg", kEntries, "IsSysProfile = yes\r\n")},
-                       {"wav.pf", PfText("WAV Audio", "wav", "wav", kEntries, "IsSysProfile = yes\r\n")},
-                       {"wma.pf", PfText("WMA Audio", "wma", "wma", kEntries, "IsSysProfile = yes\r\n")}});
+        WriteProfiles(
+            {{"mp3.pf", PfText("MP3 Audio", "mp3", "mp3", kEntries, "IsSysProfile = yes\r\n")},
+             {"ogg.pf", PfText("OGG Vorbis", "ogg", "ogg", kEntries, "IsSysProfile = yes\r\n")},
+             {"wav.pf", PfText("WAV Audio", "wav", "wav", kEntries, "IsSysProfile = yes\r\n")},
+             {"wma.pf", PfText("WMA Audio", "wma", "wma", kEntries, "IsSysProfile = yes\r\n")}});
         ASSERT_EQ(GetAppConfig().GetBaseDirectory(), m_base);
         GetAppConfig().SetInt("last_run_function", 0);
         GetAppConfig().SetString("last_profile_path", SystemPath("ogg.pf").c_str());
@@ -140,7 +142,8 @@ protected:
     }
     std::vector<std::string> EntryNames() const {
         std::vector<std::string> names;
-        for (int i = 0; i < m_bar->GetProfileCount(); ++i) names.push_back(m_bar->GetProfileAt(i)->GetName());
+        for (int i = 0; i < m_bar->GetProfileCount(); ++i)
+            names.push_back(m_bar->GetProfileAt(i)->GetName());
         return names;
     }
     // The name dialog answered with `typed`.
@@ -154,7 +157,8 @@ protected:
     std::string StateLine(const std::string& key) const {
         std::istringstream lines(m_bar->DescribeState());
         for (std::string line; std::getline(lines, line);) {
-            if (line.rfind(key + "=", 0) == 0) return line.substr(key.size() + 1);
+            if (line.rfind(key + "=", 0) == 0)
+                return line.substr(key.size() + 1);
         }
         return "<none>";
     }
@@ -178,7 +182,8 @@ TEST_F(SideBarTest, CatalogueLoadsTheLastProfileFirstAndLeavesOutUnadmittedForma
     EXPECT_EQ(StateLine("profile"), "OGG Vorbis  (*.ogg)");
     EXPECT_EQ(m_hub.chosen, std::vector<int>{0});
     EXPECT_EQ(m_hub.loadedNotices, 1);
-    EXPECT_EQ(m_bar->FindProfileByPath(SystemPath("WAV.PF")), m_bar->FindProfileByPath(SystemPath("wav.pf")));
+    EXPECT_EQ(m_bar->FindProfileByPath(SystemPath("WAV.PF")),
+              m_bar->FindProfileByPath(SystemPath("wav.pf")));
     EXPECT_GE(m_bar->FindProfileByPath(SystemPath("wav.pf")), 1);
     EXPECT_EQ(m_bar->FindProfileByPath(SystemPath("wma.pf")), -1);
     EXPECT_GT(m_bar->DropDownWidth(), 0);
@@ -196,7 +201,8 @@ TEST_F(SideBarTest, UserProfilesSurviveARestartThroughSaveAsRenameAndDelete) {
     m_bar->SaveProfile(true);
     EXPECT_FALSE(m_dialogAccepted);
     ASSERT_EQ(m_messages.size(), 1u);
-    EXPECT_EQ(m_messages[0], "The profile name has already existed. Please change to another name.");
+    EXPECT_EQ(m_messages[0],
+              "The profile name has already existed. Please change to another name.");
     EXPECT_EQ(m_bar->GetProfileCount(), 3);
 
     Answer("  Mine.pf ");
