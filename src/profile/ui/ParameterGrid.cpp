@@ -49,6 +49,7 @@ ParameterGrid::ParameterGrid(wxWindow* parent, int id) : PropertiesCtrl(parent, 
 
 void ParameterGrid::SetSets(const std::vector<ParameterSet*>& sets) {
     m_sets = sets;
+    m_showingCurrent = false;
     Rebuild();
 }
 
@@ -87,11 +88,13 @@ void ParameterGrid::Rebuild() {
     }
     SetExpanded(m_categories[Slot(GridCategory::Expert)], false);
 
-    bool disableAll = false;
-    if (m_sets.empty() && m_current != nullptr) {
+    // Without rows the grid shows the current profile, which may have changed since.
+    if (m_showingCurrent)
+        m_sets.clear();
+    m_showingCurrent = m_sets.empty() && m_current != nullptr;
+    if (m_showingCurrent)
         m_sets.push_back(m_current);
-        disableAll = true;
-    }
+    const bool disableAll = m_showingCurrent;
     for (const GridItemPlan& plan : PlanGridItems(m_sets, WorkMode() == 1, disableAll)) {
         const ParameterDef& def = ParameterTable()[static_cast<std::size_t>(plan.id)];
         const PropertyIterator item =

@@ -48,6 +48,7 @@ private:
 
     Profile* m_current = nullptr;
     std::vector<ParameterSet*> m_sets;
+    bool m_showingCurrent = false;  // m_sets holds only the current profile, for want of rows
     std::array<PropertyIterator, 7> m_categories{};  // in GridCategory order
     std::vector<std::pair<std::string, PropertyIterator>> m_entries;
     std::function<void(const std::string&, const std::string&)> m_valueListener;

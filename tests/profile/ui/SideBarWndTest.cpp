@@ -311,6 +311,27 @@ TEST_F(SideBarSets, ASliderTakesEffectOnlyWhenReleased) {
     EXPECT_NE(StateLine("grid").find("vol_factor:150%;"), std::string::npos);
 }
 
+TEST_F(SideBarSets, SelectorFollowsTheRowsCommonProfileAndNoRowsShowTheProfileDisabled) {
+    const int wav = m_bar->FindProfileByPath(SystemPath("wav.pf"));
+    m_bar->SelectIndex(wav, false);
+    EXPECT_TRUE(m_hub.applied.empty()) << "no handler without being asked";
+    m_bar->FollowSelection(m_hub.selected);
+    EXPECT_EQ(m_bar->GetSelectedIndex(), 0);
+    EXPECT_TRUE(m_hub.applied.empty());
+
+    // No row: the grid shows the profile the selector shows, every item disabled.
+    m_hub.selected.clear();
+    m_bar->SelectIndex(wav, true);
+    ParameterGrid* grid = m_bar->Grid();
+    EXPECT_EQ(grid->Sets(), std::vector<ParameterSet*>{m_bar->GetProfileAt(wav)});
+    const PropertyIterator ab = grid->FindById(FindParameterIndex("ab"));
+    ASSERT_TRUE(ab.IsValid());
+    EXPECT_FALSE(grid->IsEnabled(ab));
+    m_bar->SetCurrentProfile(m_bar->GetProfileAt(0));
+    grid->Rebuild();
+    EXPECT_EQ(grid->Sets(), std::vector<ParameterSet*>{m_bar->GetProfileAt(0)});
+}
+
 TEST_F(SideBarSets, ModesAndTheBitRateOfLosslessFormats) {
     EXPECT_EQ(StateLine("advanced"), "0");
     wxCommandEvent press(wxEVT_BUTTON, sidebar::kAdvanced);
