@@ -271,8 +271,10 @@ void PropertyTree::PlaceEditor() {
         window->Hide();
         return;
     }
+    // A frameless edit draws its text at its left edge; painted values start 4 pixels in.
+    const int inset = window == m_edit ? kEditTextInset : 0;
     const wxRect row = RowRect(index);
-    window->SetSize(ValueLeft(), row.GetTop(), width, row.GetHeight() - 1);
+    window->SetSize(ValueLeft() + inset, row.GetTop(), width - inset, row.GetHeight() - 1);
     window->Show();
 }
 

@@ -27,6 +27,7 @@ public:
     static constexpr int kDefaultGutterWidth = 16;
     static constexpr int kDefaultLabelColumnWidth = 150;
     static constexpr int kMinColumnWidth = 20;
+    static constexpr int kEditTextInset = 4;
 
     PropertyTree(PropertiesCtrl* owner, int id);
     ~PropertyTree() override;

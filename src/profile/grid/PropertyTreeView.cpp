@@ -129,8 +129,11 @@ void PropertyTree::OnPaint(wxPaintEvent&) {
 void PropertyTree::PaintRow(wxDC& dc, const PropertyNode* node, const wxRect& row) {
     const GWCPropertyItem& item = *node->item;
     const wxColour shade = Blend(m_background, m_gridLineColor, 0.28);
-    const wxWindow* focus = FindFocus();
-    const bool focused = focus == this || (focus != nullptr && focus->GetParent() == this);
+    bool focused = false;
+    for (const wxWindow* focus = FindFocus(); focus != nullptr && !focused;
+         focus = focus->GetParent()) {
+        focused = focus == this;
+    }
     const bool selected = node == m_selection;
     const wxColour highlight = focused ? wxSystemSettings::GetColour(wxSYS_COLOUR_HIGHLIGHT)
                                        : Blend(m_background, m_gridLineColor, 0.55);
@@ -396,6 +399,11 @@ void PropertyTree::UpdateScrollBar() {
     const int count = static_cast<int>(VisibleNodes().size());
     const int page = PageRows();
     m_topRow = std::clamp(m_topRow, 0, std::max(0, count - page));
+    // GTK complains about a scroll bar laid out in less than a row before the first layout.
+    if (GetClientSize().GetHeight() < RowHeight()) {
+        SetScrollbar(wxVERTICAL, 0, 0, 0);
+        return;
+    }
     SetScrollbar(wxVERTICAL, m_topRow, page, count);
 }
 
