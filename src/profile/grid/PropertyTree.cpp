@@ -22,9 +22,9 @@ PropertyTree::PropertyTree(PropertiesCtrl* owner, int id)
 }
 
 PropertyTree::~PropertyTree() {
-    // The rows go before the windows; nothing may call back into a half-destroyed owner.
-    m_editorNode = nullptr;
-    m_selection = nullptr;
+    // The editors go while the tree is whole: a last focus event of theirs still asks it.
+    Shutdown();
+    DestroyChildren();
 }
 
 // --- rows
@@ -438,6 +438,8 @@ void PropertyTree::SetGridLineColor(const wxColour& colour) {
 
 void PropertyTree::SetRowBackground(const wxColour& colour) {
     m_background = colour;
+    m_edit->SetBackgroundColour(colour);
+    m_list->EditWindow()->SetBackgroundColour(colour);
     Refresh();
 }
 

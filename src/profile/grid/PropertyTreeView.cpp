@@ -2,6 +2,8 @@
 
 #include "profile/grid/PropertyTree.h"
 
+#include "profile/grid/InPlaceEditors.h"
+
 #include <wx/dcbuffer.h>
 #include <wx/renderer.h>
 #include <wx/settings.h>
@@ -226,8 +228,12 @@ void PropertyTree::OnMouseDown(wxMouseEvent& event) {
     if (event.GetX() >= ValueLeft()) {
         if (node->item->IsHotLink()) {
             m_owner->OnHotLinkClicked(IteratorOf(node));
-        } else {
-            FocusEditor();
+            return;
+        }
+        FocusEditor();
+        // The press that selects a list row may already be on its drop button.
+        if (m_editorNode == node && IsListOpen() && m_list->IsOnButton(event.GetX() - ValueLeft())) {
+            m_list->ToggleList();
         }
     }
 }

@@ -8,6 +8,7 @@
 #include <wx/app.h>
 #include <wx/frame.h>
 #include <wx/init.h>
+#include <wx/textctrl.h>
 
 #include <gtest/gtest.h>
 
@@ -196,6 +197,26 @@ TEST_F(PropertiesCtrlTest, DisabledRowShowsItsValueAndOpensNoEditor) {
     EXPECT_EQ(m_grid->Tree()->EditorNode(), nullptr) << "disabling closes an open editor";
 }
 
+TEST_F(PropertiesCtrlTest, EditCommitsWhenItLosesTheFocusAndOnEnter) {
+    m_grid->Select(m_bitrate);
+    wxTextCtrl* edit = m_grid->Tree()->OpenEditText();
+    ASSERT_NE(edit, nullptr);
+    edit->ChangeValue("160");
+    wxCommandEvent enter(wxEVT_TEXT_ENTER, edit->GetId());
+    enter.SetEventObject(edit);
+    edit->GetEventHandler()->ProcessEvent(enter);
+    EXPECT_EQ(m_grid->changes, std::vector<std::string>{"Bitrate=160"});
+    edit->ChangeValue("224");
+    wxFocusEvent lost(wxEVT_KILL_FOCUS, edit->GetId());
+    lost.SetEventObject(edit);
+    edit->GetEventHandler()->ProcessEvent(lost);
+    EXPECT_EQ(m_grid->GetValueText(m_bitrate), "224");
+    edit->ChangeValue("320");
+    m_grid->Select(m_title);
+    EXPECT_EQ(m_grid->GetValueText(m_bitrate), "320") << "leaving the row commits as well";
+    EXPECT_EQ(m_grid->changes.size(), 3u);
+}
+
 TEST_F(PropertiesCtrlTest, OpenEditFollowsValuesSetByTheClient) {
     m_grid->Select(m_bitrate);
     m_grid->SetValueText(m_bitrate, "64");
@@ -230,6 +251,21 @@ TEST_F(PropertiesCtrlTest, ArrowKeysMoveTheSelectionAndFoldCategories) {
     EXPECT_EQ(m_grid->GetSelection(), m_title);
     EXPECT_EQ(m_grid->selections,
               (std::vector<std::string>{"Audio", "Bitrate", "Mode", "Audio", "Title"}));
+}
+
+TEST_F(PropertiesCtrlTest, SelectingARowBelowTheFoldScrollsItIntoView) {
+    for (int id = 200; id < 260; ++id) {
+        m_grid->AddItem(m_tags, id, "Row " + std::to_string(id), PropertyKind::Int, "0", "", "edit");
+    }
+    EXPECT_EQ(m_grid->Tree()->GetScrollPos(wxVERTICAL), 0);
+    m_grid->Select(m_grid->FindById(259));
+    const int top = m_grid->Tree()->GetScrollPos(wxVERTICAL);
+    EXPECT_GT(top, 0);
+    const int pageRows = m_grid->Tree()->GetClientSize().GetHeight() / m_grid->Tree()->RowHeight();
+    EXPECT_EQ(top, static_cast<int>(m_grid->VisibleRows().size()) - pageRows)
+        << "the last row sits at the bottom edge";
+    m_grid->SelectFirst();
+    EXPECT_EQ(m_grid->Tree()->GetScrollPos(wxVERTICAL), 0);
 }
 
 TEST_F(PropertiesCtrlTest, RemovingTakesChildrenAlongAndForgetsTheSelection) {
