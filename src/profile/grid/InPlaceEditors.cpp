@@ -224,7 +224,7 @@ void InPlaceList::ToggleList() {
     }
     const PropertyNode* node = m_tree->EditorNode();
     if (node != nullptr) {
-        OpenList(node->item->value.Options(), node->item->value.GetText());
+        OpenList(node->item->value.ChoiceTexts(), node->item->value.GetText());
     }
 }
 

@@ -321,20 +321,14 @@ bool PropertyTree::CommitOpenEdit() {
     return true;
 }
 
-const std::vector<std::string>* PropertyTree::ListOptions(PropertyNode* node) {
-    if (node == nullptr || node != m_editorNode || !IsListOpen()) {
-        return nullptr;
-    }
-    return &node->item->value.Options();
-}
-
 bool PropertyTree::StepListValue(int keyCode) {
-    const std::vector<std::string>* options = ListOptions(m_editorNode);
-    if (options == nullptr || options->empty()) {
+    if (m_editorNode == nullptr || !IsListOpen()) {
         return false;
     }
-    const int count = static_cast<int>(options->size());
-    const int current = m_editorNode->item->value.FindOption(m_editorNode->item->value.GetText());
+    const std::vector<std::string> options = m_editorNode->item->value.ChoiceTexts();
+    const int count = static_cast<int>(options.size());
+    const auto found = std::find(options.begin(), options.end(), m_editorNode->item->value.GetText());
+    const int current = found == options.end() ? -1 : static_cast<int>(found - options.begin());
     int next = -1;
     switch (keyCode) {
         case WXK_UP:
@@ -352,10 +346,10 @@ bool PropertyTree::StepListValue(int keyCode) {
         default:
             break;
     }
-    if (next < 0 || next == current) {
+    if (next < 0 || next >= count || next == current) {
         return false;
     }
-    const bool changed = ChooseOption((*options)[static_cast<std::size_t>(next)]);
+    const bool changed = ChooseOption(options[static_cast<std::size_t>(next)]);
     if (wxTextCtrl* edit = OpenEditText()) {
         edit->SelectAll();
     }

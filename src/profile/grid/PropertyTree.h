@@ -116,7 +116,6 @@ private:
     void CloseEditor(bool commit);
     void PlaceEditor();
     void AnnounceChange(PropertyNode* node);
-    const std::vector<std::string>* ListOptions(PropertyNode* node);
 
     PropertiesCtrl* m_owner;
     PropertyNode m_root;

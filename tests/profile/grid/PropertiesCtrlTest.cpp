@@ -161,6 +161,15 @@ TEST_F(PropertiesCtrlTest, ListStepsThroughOptionsAndStopsAtTheEnds) {
     EXPECT_FALSE(m_grid->CommitEditText("Mono")) << "a plain list has no edit";
 }
 
+TEST_F(PropertiesCtrlTest, BoolListWithoutOptionsOffersFalseAndTrue) {
+    const auto flag = m_grid->AddItem(m_audio, 14, "Flag", PropertyKind::Bool, "1", "", "list");
+    EXPECT_EQ(m_grid->GetValueText(flag), "True");
+    m_grid->Select(flag);
+    EXPECT_FALSE(m_grid->StepListValue(WXK_DOWN));
+    EXPECT_TRUE(m_grid->StepListValue(WXK_UP));
+    EXPECT_EQ(m_grid->changes, std::vector<std::string>{"Flag=False"});
+}
+
 TEST_F(PropertiesCtrlTest, EditListTakesFreeTextAndStepsOptions) {
     const auto rate = m_grid->AddItem(m_audio, 12, "Rate", PropertyKind::Text, "44100", "",
                                       "editlist");
