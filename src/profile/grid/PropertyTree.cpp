@@ -461,6 +461,10 @@ int PropertyTree::RowHeight() const {
     return m_rowHeight;
 }
 
+void PropertyTree::SetListLines(int lines) {
+    m_list->SetListLines(lines);
+}
+
 void PropertyTree::EnableToolTips(bool enable) {
     m_toolTipsEnabled = enable;
     m_toolTipRow = -1;

@@ -77,6 +77,7 @@ public:
     const wxFont& TreeFont() const;
     void SetTreeFont(const wxFont& font);
     void EnableToolTips(bool enable);
+    void SetListLines(int lines);
     bool ToolTipsEnabled() const { return m_toolTipsEnabled; }
     int RowHeight() const;
     int ValueLeft() const { return m_gutterWidth + m_labelColumnWidth + 2; }
