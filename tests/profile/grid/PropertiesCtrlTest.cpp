@@ -12,6 +12,7 @@
 
 #include <gtest/gtest.h>
 
+#include <algorithm>
 #include <functional>
 
 namespace ac {
@@ -79,6 +80,21 @@ protected:
         key.m_keyCode = keyCode;
         key.SetEventObject(window);
         window->GetEventHandler()->ProcessEvent(key);
+    }
+
+    void Mouse(wxWindow* window, wxEventType type, int x, int y, bool leftDown) {
+        wxMouseEvent mouse(type);
+        mouse.m_x = x;
+        mouse.m_y = y;
+        mouse.m_leftDown = leftDown;
+        mouse.SetEventObject(window);
+        window->GetEventHandler()->ProcessEvent(mouse);
+    }
+    // The middle of a visible row, in the tree's coordinates.
+    int RowMiddle(const PropertyIterator& row) {
+        const auto rows = m_grid->VisibleRows();
+        const int index = static_cast<int>(std::find(rows.begin(), rows.end(), row) - rows.begin());
+        return index * m_grid->Tree()->RowHeight() + m_grid->Tree()->RowHeight() / 2;
     }
 
     wxFrame* m_frame = nullptr;
@@ -275,6 +291,83 @@ TEST_F(PropertiesCtrlTest, SelectingARowBelowTheFoldScrollsItIntoView) {
         << "the last row sits at the bottom edge";
     m_grid->SelectFirst();
     EXPECT_EQ(m_grid->Tree()->GetScrollPos(wxVERTICAL), 0);
+}
+
+TEST_F(PropertiesCtrlTest, ClicksSelectFoldAndOpenTheEditor) {
+    wxWindow* tree = m_grid->Tree();
+    Mouse(tree, wxEVT_LEFT_DOWN, 40, RowMiddle(m_audio), true);
+    EXPECT_EQ(m_grid->GetSelection(), m_audio);
+    EXPECT_EQ(m_grid->VisibleRows().size(), 3u) << "a click on a category folds it";
+    Mouse(tree, wxEVT_LEFT_DOWN, 40, RowMiddle(m_audio), true);
+    EXPECT_EQ(m_grid->VisibleRows().size(), 5u);
+
+    Mouse(tree, wxEVT_LEFT_DOWN, 40, RowMiddle(m_bitrate), true);
+    EXPECT_EQ(m_grid->GetSelection(), m_bitrate);
+    EXPECT_NE(wxWindow::FindFocus(), m_grid->Tree()->OpenEditText()) << "the label keeps focus";
+    const int valueX = m_grid->Tree()->ValueLeft() + 10;
+    Mouse(tree, wxEVT_LEFT_DOWN, valueX, RowMiddle(m_title), true);
+    EXPECT_EQ(m_grid->GetSelection(), m_title);
+    ASSERT_NE(m_grid->Tree()->OpenEditText(), nullptr);
+    EXPECT_TRUE(m_grid->Tree()->OpenEditText()->IsShown());
+}
+
+TEST_F(PropertiesCtrlTest, DraggingTheColumnEdgeAndTheGripGoesThroughTheLimits) {
+    wxWindow* tree = m_grid->Tree();
+    const int edge = 16 + 1 + m_grid->GetLabelColumnWidth();
+    Mouse(tree, wxEVT_LEFT_DOWN, edge, RowMiddle(m_bitrate), true);
+    Mouse(tree, wxEVT_MOTION, 16 + 1 + 100, RowMiddle(m_bitrate), true);
+    EXPECT_EQ(m_grid->GetLabelColumnWidth(), 100);
+    Mouse(tree, wxEVT_MOTION, 2, RowMiddle(m_bitrate), true);
+    EXPECT_EQ(m_grid->GetLabelColumnWidth(), 20);
+    Mouse(tree, wxEVT_LEFT_UP, 2, RowMiddle(m_bitrate), false);
+    Mouse(tree, wxEVT_MOTION, 16 + 1 + 150, RowMiddle(m_bitrate), false);
+    EXPECT_EQ(m_grid->GetLabelColumnWidth(), 20) << "the drag ended with the release";
+
+    m_grid->ShowComment(true);
+    const int height = m_grid->GetClientSize().GetHeight();
+    const int gripTop = height - m_grid->GetCommentHeight();
+    Mouse(m_grid, wxEVT_LEFT_DOWN, 50, gripTop + 2, true);
+    Mouse(m_grid, wxEVT_MOTION, 50, gripTop - 60, true);
+    EXPECT_EQ(m_grid->GetCommentHeight(), 40 + 62);
+    Mouse(m_grid, wxEVT_MOTION, 50, -500, true);
+    EXPECT_EQ(m_grid->GetCommentHeight(), height - 25);
+    Mouse(m_grid, wxEVT_MOTION, 50, height + 500, true);
+    EXPECT_EQ(m_grid->GetCommentHeight(), 25);
+    Mouse(m_grid, wxEVT_LEFT_UP, 50, height, false);
+}
+
+TEST_F(PropertiesCtrlTest, ToolTipsNameTheRowUnderTheMouseOnlyWhenEnabled) {
+    wxWindow* tree = m_grid->Tree();
+    Mouse(tree, wxEVT_MOTION, 40, RowMiddle(m_bitrate), false);
+    EXPECT_TRUE(tree->GetToolTipText().empty());
+    m_grid->EnableToolTips(true);
+    Mouse(tree, wxEVT_MOTION, 40, RowMiddle(m_bitrate), false);
+    EXPECT_EQ(tree->GetToolTipText(), "Bitrate: 128");
+    Mouse(tree, wxEVT_MOTION, 40, RowMiddle(m_tags), false);
+    EXPECT_EQ(tree->GetToolTipText(), "Tags");
+    m_grid->EnableToolTips(false);
+    EXPECT_TRUE(tree->GetToolTipText().empty());
+}
+
+TEST_F(PropertiesCtrlTest, DropDownCommitsTheChosenLineAndEscapeKeepsTheValue) {
+    m_grid->Select(m_mode);
+    m_grid->Tree()->FocusEditor();
+    wxWindow* list = wxWindow::FindFocus();
+    ASSERT_NE(list, nullptr);
+    PressKey(list, WXK_F4);
+    PressKey(list, WXK_DOWN);
+    PressKey(list, WXK_ESCAPE);
+    EXPECT_EQ(m_grid->GetValueText(m_mode), "Joint") << "closing without commit";
+    PressKey(list, WXK_F4);
+    PressKey(list, WXK_DOWN);
+    PressKey(list, WXK_RETURN);
+    EXPECT_EQ(m_grid->GetValueText(m_mode), "Mono");
+    PressKey(list, WXK_F4);
+    PressKey(list, WXK_RETURN);
+    EXPECT_EQ(m_grid->changes, std::vector<std::string>{"Mode=Mono"})
+        << "choosing the line of the current value raises nothing";
+    PressKey(list, WXK_UP);
+    EXPECT_EQ(m_grid->GetValueText(m_mode), "Joint") << "closed, the arrows step the value";
 }
 
 TEST_F(PropertiesCtrlTest, RemovingTakesChildrenAlongAndForgetsTheSelection) {
