@@ -145,11 +145,13 @@ void PropertyTree::SetExpanded(PropertyNode* node, bool expanded) {
     RowsChanged();
 }
 
-void PropertyTree::RefreshNode(const PropertyNode* node) {
+void PropertyTree::RefreshNode(const PropertyNode* node, bool now) {
     const int index = VisibleIndexOf(node);
     if (index >= 0) {
         RefreshRect(RowRect(index));
-        Update();
+        if (now) {
+            Update();
+        }
     }
 }
 
@@ -381,7 +383,7 @@ bool PropertyTree::ChooseOption(const std::string& text) {
 
 void PropertyTree::AnnounceChange(PropertyNode* node) {
     // The row shows the new value before the client hears of it.
-    RefreshNode(node);
+    RefreshNode(node, true);
     m_owner->OnPropertyChanged(PropertyIterator(this, node));
 }
 

@@ -40,8 +40,10 @@ public:
     bool Contains(const PropertyNode* node) const;
     const std::vector<PropertyNode*>& VisibleNodes() const;
     void SetExpanded(PropertyNode* node, bool expanded);
-    // Repaints one row at once, so that what a notification reads is on screen too.
-    void RefreshNode(const PropertyNode* node);
+    // Repaints one row; `now` paints before returning, so that a notification that follows
+    // finds the new value on screen too. Client writes wait for the next paint instead, since
+    // one change may rewrite every row.
+    void RefreshNode(const PropertyNode* node, bool now = false);
     // Rows, help or values changed: repaint, and the open editor follows the value.
     void NodeChanged(PropertyNode* node);
 

@@ -114,8 +114,11 @@ void PropertyTree::OnPaint(wxPaintEvent&) {
     dc.SetBackground(wxBrush(m_background));
     dc.Clear();
     const auto& rows = VisibleNodes();
-    const int height = GetClientSize().GetHeight();
-    for (int index = m_topRow; index < static_cast<int>(rows.size()); ++index) {
+    // Only the rows in the damaged band: a changed value repaints one row, not the page.
+    const wxRect damaged = GetUpdateRegion().GetBox();
+    const int first = std::max(m_topRow, RowAt(damaged.GetTop()));
+    const int height = std::min(GetClientSize().GetHeight(), damaged.GetBottom() + 1);
+    for (int index = first; index < static_cast<int>(rows.size()); ++index) {
         const wxRect row = RowRect(index);
         if (row.GetTop() >= height) {
             break;
