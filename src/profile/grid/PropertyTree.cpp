@@ -215,7 +215,8 @@ void PropertyTree::OpenEditor(PropertyNode* node) {
         return;
     }
     const std::string text = node->item->value.GetText();
-    switch (node->item->editor->Style()) {
+    m_openStyle = node->item->editor->Style();
+    switch (m_openStyle) {
         case InPlaceStyle::None:
             return;
         case InPlaceStyle::Edit:
@@ -230,11 +231,11 @@ void PropertyTree::OpenEditor(PropertyNode* node) {
         case InPlaceStyle::EditList:
             m_editorNode = node;
             m_list->SetFont(TreeFont());
-            m_list->Attach(node->item->editor->Style() == InPlaceStyle::EditList, text);
+            m_list->Attach(m_openStyle == InPlaceStyle::EditList, text);
             break;
     }
     PlaceEditor();
-    m_owner->OnInPlaceShown(node->item->editor->Style() == InPlaceStyle::Edit
+    m_owner->OnInPlaceShown(m_openStyle == InPlaceStyle::Edit
                                 ? static_cast<wxWindow*>(m_edit)
                                 : static_cast<wxWindow*>(m_list),
                             PropertyIterator(this, node));
@@ -264,7 +265,7 @@ void PropertyTree::PlaceEditor() {
     if (m_editorNode == nullptr) {
         return;
     }
-    wxWindow* window = m_editorNode->item->editor->Style() == InPlaceStyle::Edit
+    wxWindow* window = m_openStyle == InPlaceStyle::Edit
                            ? static_cast<wxWindow*>(m_edit)
                            : static_cast<wxWindow*>(m_list);
     const int index = VisibleIndexOf(m_editorNode);
@@ -284,7 +285,7 @@ wxTextCtrl* PropertyTree::OpenEditText() const {
     if (m_editorNode == nullptr) {
         return nullptr;
     }
-    switch (m_editorNode->item->editor->Style()) {
+    switch (m_openStyle) {
         case InPlaceStyle::Edit:
             return m_edit;
         case InPlaceStyle::EditList:
@@ -298,7 +299,7 @@ bool PropertyTree::IsListOpen() const {
     if (m_editorNode == nullptr) {
         return false;
     }
-    const InPlaceStyle style = m_editorNode->item->editor->Style();
+    const InPlaceStyle style = m_openStyle;
     return style == InPlaceStyle::List || style == InPlaceStyle::EditList ||
            style == InPlaceStyle::CustomList;
 }

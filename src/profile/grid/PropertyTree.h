@@ -129,6 +129,8 @@ private:
 
     PropertyNode* m_selection = nullptr;
     PropertyNode* m_editorNode = nullptr;
+    // Kept apart from the row: a client may point the row at another editor while it is open.
+    InPlaceStyle m_openStyle = InPlaceStyle::None;
     InPlaceEdit* m_edit = nullptr;
     InPlaceList* m_list = nullptr;
 

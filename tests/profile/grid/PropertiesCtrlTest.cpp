@@ -370,6 +370,38 @@ TEST_F(PropertiesCtrlTest, DropDownCommitsTheChosenLineAndEscapeKeepsTheValue) {
     EXPECT_EQ(m_grid->GetValueText(m_mode), "Joint") << "closed, the arrows step the value";
 }
 
+TEST_F(PropertiesCtrlTest, ChangingTheSelectedRowsEditorSwapsTheOpenWindow) {
+    m_grid->Select(m_title);
+    ASSERT_NE(m_grid->Tree()->OpenEditText(), nullptr);
+    m_grid->SetEditor(m_title, m_grid->FindEditor("list"));
+    EXPECT_EQ(m_grid->Tree()->OpenEditText(), nullptr) << "a plain list has no edit";
+    EXPECT_EQ(m_grid->Tree()->EditorNode(), m_title.Node());
+    m_grid->SetEditor(m_title, nullptr);
+    EXPECT_EQ(m_grid->Tree()->EditorNode(), nullptr);
+    m_grid->SetEditor(m_title, m_grid->FindEditor("editlist"));
+    EXPECT_TRUE(m_grid->CommitEditText("Intro"));
+    EXPECT_EQ(m_grid->changes, std::vector<std::string>{"Title=Intro"});
+}
+
+TEST_F(PropertiesCtrlTest, NestedRowsFoldUnderTheirItemAndRemovingASiblingKeepsTheSelection) {
+    const auto low = m_grid->AddItem(m_bitrate, 30, "Low", PropertyKind::Int, "32", "", "edit");
+    m_grid->AddItem(low, 31, "Floor", PropertyKind::Int, "8", "", "edit");
+    EXPECT_EQ(Labels(m_grid->VisibleRows()),
+              (std::vector<std::string>{"Audio", "Bitrate", "Low", "Floor", "Mode", "Tags",
+                                        "Title"}));
+    m_grid->SetExpanded(m_bitrate, false);
+    EXPECT_EQ(Labels(m_grid->VisibleRows()),
+              (std::vector<std::string>{"Audio", "Bitrate", "Mode", "Tags", "Title"}));
+    m_grid->SetExpanded(m_bitrate, true);
+    m_grid->SetExpanded(low, false);
+    EXPECT_EQ(m_grid->VisibleRows().size(), 6u);
+    m_grid->Select(m_mode);
+    m_grid->Remove(m_bitrate);
+    EXPECT_EQ(m_grid->GetSelection(), m_mode);
+    EXPECT_EQ(m_grid->ChildCount(m_audio), 1);
+    EXPECT_TRUE(m_grid->StepListValue(WXK_DOWN)) << "its editor stayed open";
+}
+
 TEST_F(PropertiesCtrlTest, RemovingTakesChildrenAlongAndForgetsTheSelection) {
     const auto nested = m_grid->AddItem(m_bitrate, 13, "Minimum", PropertyKind::Int, "32", "");
     EXPECT_EQ(m_grid->ChildCount(m_bitrate), 1);
