@@ -123,7 +123,9 @@ int InPlaceList::ButtonWidth() const {
 void InPlaceList::LayoutParts() {
     const wxSize size = GetClientSize();
     if (m_withEdit) {
-        m_edit->SetSize(0, 0, std::max(0, size.GetWidth() - ButtonWidth()), size.GetHeight());
+        const int inset = PropertyTree::kEditTextInset;
+        m_edit->SetSize(inset, 0, std::max(0, size.GetWidth() - ButtonWidth() - inset),
+                        size.GetHeight());
     }
 }
 
@@ -151,7 +153,7 @@ void InPlaceList::OnPaint(wxPaintEvent&) {
                                                                  : wxSYS_COLOUR_WINDOWTEXT));
         const wxString text = wxString::FromUTF8(m_text);
         wxDCClipper clip(dc, wxRect(0, 0, button.GetLeft(), size.GetHeight()));
-        dc.DrawText(text, 4, (size.GetHeight() - dc.GetCharHeight()) / 2);
+        dc.DrawText(text, PropertyTree::kEditTextInset, (size.GetHeight() - dc.GetCharHeight()) / 2);
     }
     wxRendererNative::Get().DrawDropArrow(this, dc, button,
                                           IsDropped() ? int{wxCONTROL_PRESSED} : 0);
@@ -222,7 +224,7 @@ void InPlaceList::ToggleList() {
     }
     const PropertyNode* node = m_tree->EditorNode();
     if (node != nullptr) {
-        OpenList(node->item->value.Options(), node->item->value.GetText());
+        OpenList(node->item->value.ChoiceTexts(), node->item->value.GetText());
     }
 }
 
@@ -237,7 +239,9 @@ void InPlaceList::OpenList(const std::vector<std::string>& options, const std::s
     m_popup->SetFont(GetFont());
     m_popup->Fill(options, current);
     const int lines = std::clamp(m_popup->LineCount(), 2, std::max(2, m_listLines));
-    const wxSize size(GetSize().GetWidth(), lines * m_popup->LineHeight() + 2);
+    // Room for the lines, the pop-up's border and the list's own frame, so no scroll bar shows
+    // while every option fits.
+    const wxSize size(GetSize().GetWidth(), lines * m_popup->LineHeight() + 6);
     wxPoint origin = ClientToScreen(wxPoint(0, GetSize().GetHeight()));
     const int display = wxDisplay::GetFromWindow(this);
     const wxRect area = wxDisplay(display == wxNOT_FOUND ? 0u : static_cast<unsigned>(display))
@@ -279,11 +283,16 @@ void InPlaceList::PopupDismissed() {
 // --- ListPopup
 
 ListPopup::ListPopup(InPlaceList* owner)
-    : wxPopupTransientWindow(owner, wxBORDER_SIMPLE),
+    : wxPopupTransientWindow(owner, wxBORDER_NONE),
       m_owner(owner),
-      m_box(new wxListBox(this, wxID_ANY, wxDefaultPosition, wxDefaultSize, 0, nullptr,
+      m_box(new wxListBox(this, wxID_ANY, wxDefaultPosition, wxSize(100, 100), 0, nullptr,
                           wxLB_SINGLE | wxBORDER_NONE)) {
-    Bind(wxEVT_SIZE, [this](wxSizeEvent&) { m_box->SetSize(GetClientSize()); });
+    // A one-pixel frame round the list, drawn by the pop-up's own background.
+    SetBackgroundColour(wxSystemSettings::GetColour(wxSYS_COLOUR_BTNSHADOW));
+    Bind(wxEVT_SIZE, [this](wxSizeEvent&) {
+        const wxSize size = GetClientSize();
+        m_box->SetSize(1, 1, std::max(0, size.GetWidth() - 2), std::max(0, size.GetHeight() - 2));
+    });
     m_box->Bind(wxEVT_KEY_DOWN, &ListPopup::OnListKey, this);
     m_box->Bind(wxEVT_LEFT_DOWN, [this](wxMouseEvent& event) {
         m_pressed = true;
@@ -311,6 +320,7 @@ void ListPopup::Fill(const std::vector<std::string>& options, const std::string&
     if (found != options.end()) {
         m_box->SetSelection(static_cast<int>(found - options.begin()));
     }
+    m_box->InvalidateBestSize();
     m_pressed = false;
 }
 

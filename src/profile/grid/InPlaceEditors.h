@@ -42,11 +42,15 @@ public:
     void Attach(bool withEdit, const std::string& text);
     void SetText(const std::string& text);
     wxTextCtrl* Edit() const { return m_withEdit ? m_edit : nullptr; }
+    wxTextCtrl* EditWindow() const { return m_edit; }
     bool IsDropped() const;
     void OpenList(const std::vector<std::string>& options, const std::string& current);
     void CloseList(bool commit);
     void SetListLines(int lines);
     void PopupDismissed();
+    // The drop button's work: opens the list, or closes it with commit when it is open.
+    void ToggleList();
+    bool IsOnButton(int x) const { return x >= GetClientSize().GetWidth() - ButtonWidth(); }
     // Keys shared by the window and the edit inside it; true when handled.
     bool HandleKey(const wxKeyEvent& event);
 
@@ -58,7 +62,6 @@ private:
     void OnMouseDown(wxMouseEvent& event);
     void OnKeyDown(wxKeyEvent& event);
     void OnFocus(wxFocusEvent& event);
-    void ToggleList();
 
     PropertyTree* m_tree;
     InPlaceEdit* m_edit;

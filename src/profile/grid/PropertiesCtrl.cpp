@@ -293,6 +293,10 @@ void PropertiesCtrl::SetTreeFont(const wxFont& font) {
     Refresh(false);
 }
 
+void PropertiesCtrl::SetListLines(int lines) {
+    m_tree->SetListLines(lines);
+}
+
 // --- notifications: nothing by default
 
 void PropertiesCtrl::OnPropertyChanged(const PropertyIterator&) {}

@@ -67,6 +67,8 @@ public:
     wxColour GetGridLineColor() const;
     void SetBackgroundColour2(const wxColour& background, const wxColour& commentBackground);
     void SetTreeFont(const wxFont& font);
+    // Lines the drop-down list of a list editor shows before it scrolls; at least 2.
+    void SetListLines(int lines);
 
     PropertyIterator AddCategory(int id, const std::string& label, const std::string& help);
     // `parent` is a category or an item; `editorName` names a registered editor ("edit",

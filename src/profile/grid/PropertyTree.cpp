@@ -22,9 +22,9 @@ PropertyTree::PropertyTree(PropertiesCtrl* owner, int id)
 }
 
 PropertyTree::~PropertyTree() {
-    // The rows go before the windows; nothing may call back into a half-destroyed owner.
-    m_editorNode = nullptr;
-    m_selection = nullptr;
+    // The editors go while the tree is whole: a last focus event of theirs still asks it.
+    Shutdown();
+    DestroyChildren();
 }
 
 // --- rows
@@ -145,11 +145,13 @@ void PropertyTree::SetExpanded(PropertyNode* node, bool expanded) {
     RowsChanged();
 }
 
-void PropertyTree::RefreshNode(const PropertyNode* node) {
+void PropertyTree::RefreshNode(const PropertyNode* node, bool now) {
     const int index = VisibleIndexOf(node);
     if (index >= 0) {
         RefreshRect(RowRect(index));
-        Update();
+        if (now) {
+            Update();
+        }
     }
 }
 
@@ -213,7 +215,8 @@ void PropertyTree::OpenEditor(PropertyNode* node) {
         return;
     }
     const std::string text = node->item->value.GetText();
-    switch (node->item->editor->Style()) {
+    m_openStyle = node->item->editor->Style();
+    switch (m_openStyle) {
         case InPlaceStyle::None:
             return;
         case InPlaceStyle::Edit:
@@ -228,11 +231,11 @@ void PropertyTree::OpenEditor(PropertyNode* node) {
         case InPlaceStyle::EditList:
             m_editorNode = node;
             m_list->SetFont(TreeFont());
-            m_list->Attach(node->item->editor->Style() == InPlaceStyle::EditList, text);
+            m_list->Attach(m_openStyle == InPlaceStyle::EditList, text);
             break;
     }
     PlaceEditor();
-    m_owner->OnInPlaceShown(node->item->editor->Style() == InPlaceStyle::Edit
+    m_owner->OnInPlaceShown(m_openStyle == InPlaceStyle::Edit
                                 ? static_cast<wxWindow*>(m_edit)
                                 : static_cast<wxWindow*>(m_list),
                             PropertyIterator(this, node));
@@ -262,7 +265,7 @@ void PropertyTree::PlaceEditor() {
     if (m_editorNode == nullptr) {
         return;
     }
-    wxWindow* window = m_editorNode->item->editor->Style() == InPlaceStyle::Edit
+    wxWindow* window = m_openStyle == InPlaceStyle::Edit
                            ? static_cast<wxWindow*>(m_edit)
                            : static_cast<wxWindow*>(m_list);
     const int index = VisibleIndexOf(m_editorNode);
@@ -271,8 +274,10 @@ void PropertyTree::PlaceEditor() {
         window->Hide();
         return;
     }
+    // A frameless edit draws its text at its left edge; painted values start 4 pixels in.
+    const int inset = window == m_edit ? kEditTextInset : 0;
     const wxRect row = RowRect(index);
-    window->SetSize(ValueLeft(), row.GetTop(), width, row.GetHeight() - 1);
+    window->SetSize(ValueLeft() + inset, row.GetTop(), width - inset, row.GetHeight() - 1);
     window->Show();
 }
 
@@ -280,7 +285,7 @@ wxTextCtrl* PropertyTree::OpenEditText() const {
     if (m_editorNode == nullptr) {
         return nullptr;
     }
-    switch (m_editorNode->item->editor->Style()) {
+    switch (m_openStyle) {
         case InPlaceStyle::Edit:
             return m_edit;
         case InPlaceStyle::EditList:
@@ -294,7 +299,7 @@ bool PropertyTree::IsListOpen() const {
     if (m_editorNode == nullptr) {
         return false;
     }
-    const InPlaceStyle style = m_editorNode->item->editor->Style();
+    const InPlaceStyle style = m_openStyle;
     return style == InPlaceStyle::List || style == InPlaceStyle::EditList ||
            style == InPlaceStyle::CustomList;
 }
@@ -319,20 +324,14 @@ bool PropertyTree::CommitOpenEdit() {
     return true;
 }
 
-const std::vector<std::string>* PropertyTree::ListOptions(PropertyNode* node) {
-    if (node == nullptr || node != m_editorNode || !IsListOpen()) {
-        return nullptr;
-    }
-    return &node->item->value.Options();
-}
-
 bool PropertyTree::StepListValue(int keyCode) {
-    const std::vector<std::string>* options = ListOptions(m_editorNode);
-    if (options == nullptr || options->empty()) {
+    if (m_editorNode == nullptr || !IsListOpen()) {
         return false;
     }
-    const int count = static_cast<int>(options->size());
-    const int current = m_editorNode->item->value.FindOption(m_editorNode->item->value.GetText());
+    const std::vector<std::string> options = m_editorNode->item->value.ChoiceTexts();
+    const int count = static_cast<int>(options.size());
+    const auto found = std::find(options.begin(), options.end(), m_editorNode->item->value.GetText());
+    const int current = found == options.end() ? -1 : static_cast<int>(found - options.begin());
     int next = -1;
     switch (keyCode) {
         case WXK_UP:
@@ -350,10 +349,10 @@ bool PropertyTree::StepListValue(int keyCode) {
         default:
             break;
     }
-    if (next < 0 || next == current) {
+    if (next < 0 || next >= count || next == current) {
         return false;
     }
-    const bool changed = ChooseOption((*options)[static_cast<std::size_t>(next)]);
+    const bool changed = ChooseOption(options[static_cast<std::size_t>(next)]);
     if (wxTextCtrl* edit = OpenEditText()) {
         edit->SelectAll();
     }
@@ -385,7 +384,7 @@ bool PropertyTree::ChooseOption(const std::string& text) {
 
 void PropertyTree::AnnounceChange(PropertyNode* node) {
     // The row shows the new value before the client hears of it.
-    RefreshNode(node);
+    RefreshNode(node, true);
     m_owner->OnPropertyChanged(PropertyIterator(this, node));
 }
 
@@ -436,6 +435,8 @@ void PropertyTree::SetGridLineColor(const wxColour& colour) {
 
 void PropertyTree::SetRowBackground(const wxColour& colour) {
     m_background = colour;
+    m_edit->SetBackgroundColour(colour);
+    m_list->EditWindow()->SetBackgroundColour(colour);
     Refresh();
 }
 
@@ -461,6 +462,10 @@ int PropertyTree::RowHeight() const {
         m_rowHeight = dc.GetCharHeight() + 8;
     }
     return m_rowHeight;
+}
+
+void PropertyTree::SetListLines(int lines) {
+    m_list->SetListLines(lines);
 }
 
 void PropertyTree::EnableToolTips(bool enable) {

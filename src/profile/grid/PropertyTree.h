@@ -27,6 +27,7 @@ public:
     static constexpr int kDefaultGutterWidth = 16;
     static constexpr int kDefaultLabelColumnWidth = 150;
     static constexpr int kMinColumnWidth = 20;
+    static constexpr int kEditTextInset = 4;
 
     PropertyTree(PropertiesCtrl* owner, int id);
     ~PropertyTree() override;
@@ -39,8 +40,10 @@ public:
     bool Contains(const PropertyNode* node) const;
     const std::vector<PropertyNode*>& VisibleNodes() const;
     void SetExpanded(PropertyNode* node, bool expanded);
-    // Repaints one row at once, so that what a notification reads is on screen too.
-    void RefreshNode(const PropertyNode* node);
+    // Repaints one row; `now` paints before returning, so that a notification that follows
+    // finds the new value on screen too. Client writes wait for the next paint instead, since
+    // one change may rewrite every row.
+    void RefreshNode(const PropertyNode* node, bool now = false);
     // Rows, help or values changed: repaint, and the open editor follows the value.
     void NodeChanged(PropertyNode* node);
 
@@ -76,6 +79,7 @@ public:
     const wxFont& TreeFont() const;
     void SetTreeFont(const wxFont& font);
     void EnableToolTips(bool enable);
+    void SetListLines(int lines);
     bool ToolTipsEnabled() const { return m_toolTipsEnabled; }
     int RowHeight() const;
     int ValueLeft() const { return m_gutterWidth + m_labelColumnWidth + 2; }
@@ -115,7 +119,6 @@ private:
     void CloseEditor(bool commit);
     void PlaceEditor();
     void AnnounceChange(PropertyNode* node);
-    const std::vector<std::string>* ListOptions(PropertyNode* node);
 
     PropertiesCtrl* m_owner;
     PropertyNode m_root;
@@ -126,6 +129,8 @@ private:
 
     PropertyNode* m_selection = nullptr;
     PropertyNode* m_editorNode = nullptr;
+    // Kept apart from the row: a client may point the row at another editor while it is open.
+    InPlaceStyle m_openStyle = InPlaceStyle::None;
     InPlaceEdit* m_edit = nullptr;
     InPlaceList* m_list = nullptr;
 

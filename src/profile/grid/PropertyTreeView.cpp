@@ -2,6 +2,8 @@
 
 #include "profile/grid/PropertyTree.h"
 
+#include "profile/grid/InPlaceEditors.h"
+
 #include <wx/dcbuffer.h>
 #include <wx/renderer.h>
 #include <wx/settings.h>
@@ -112,8 +114,11 @@ void PropertyTree::OnPaint(wxPaintEvent&) {
     dc.SetBackground(wxBrush(m_background));
     dc.Clear();
     const auto& rows = VisibleNodes();
-    const int height = GetClientSize().GetHeight();
-    for (int index = m_topRow; index < static_cast<int>(rows.size()); ++index) {
+    // Only the rows in the damaged band: a changed value repaints one row, not the page.
+    const wxRect damaged = GetUpdateRegion().GetBox();
+    const int first = std::max(m_topRow, RowAt(damaged.GetTop()));
+    const int height = std::min(GetClientSize().GetHeight(), damaged.GetBottom() + 1);
+    for (int index = first; index < static_cast<int>(rows.size()); ++index) {
         const wxRect row = RowRect(index);
         if (row.GetTop() >= height) {
             break;
@@ -129,8 +134,11 @@ void PropertyTree::OnPaint(wxPaintEvent&) {
 void PropertyTree::PaintRow(wxDC& dc, const PropertyNode* node, const wxRect& row) {
     const GWCPropertyItem& item = *node->item;
     const wxColour shade = Blend(m_background, m_gridLineColor, 0.28);
-    const wxWindow* focus = FindFocus();
-    const bool focused = focus == this || (focus != nullptr && focus->GetParent() == this);
+    bool focused = false;
+    for (const wxWindow* focus = FindFocus(); focus != nullptr && !focused;
+         focus = focus->GetParent()) {
+        focused = focus == this;
+    }
     const bool selected = node == m_selection;
     const wxColour highlight = focused ? wxSystemSettings::GetColour(wxSYS_COLOUR_HIGHLIGHT)
                                        : Blend(m_background, m_gridLineColor, 0.55);
@@ -223,8 +231,12 @@ void PropertyTree::OnMouseDown(wxMouseEvent& event) {
     if (event.GetX() >= ValueLeft()) {
         if (node->item->IsHotLink()) {
             m_owner->OnHotLinkClicked(IteratorOf(node));
-        } else {
-            FocusEditor();
+            return;
+        }
+        FocusEditor();
+        // The press that selects a list row may already be on its drop button.
+        if (m_editorNode == node && IsListOpen() && m_list->IsOnButton(event.GetX() - ValueLeft())) {
+            m_list->ToggleList();
         }
     }
 }
@@ -396,6 +408,11 @@ void PropertyTree::UpdateScrollBar() {
     const int count = static_cast<int>(VisibleNodes().size());
     const int page = PageRows();
     m_topRow = std::clamp(m_topRow, 0, std::max(0, count - page));
+    // GTK complains about a scroll bar laid out in less than a row before the first layout.
+    if (GetClientSize().GetHeight() < RowHeight()) {
+        SetScrollbar(wxVERTICAL, 0, 0, 0);
+        return;
+    }
     SetScrollbar(wxVERTICAL, m_topRow, page, count);
 }
 

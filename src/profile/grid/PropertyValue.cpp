@@ -195,6 +195,13 @@ int PropertyValue::FindOption(const std::string& text) const {
     return found == m_options.end() ? -1 : static_cast<int>(found - m_options.begin());
 }
 
+std::vector<std::string> PropertyValue::ChoiceTexts() const {
+    if (m_kind == PropertyKind::Bool && m_options.size() < 2) {
+        return {"False", "True"};
+    }
+    return m_options;
+}
+
 void PropertyValue::UseChosenSet(bool use) {
     m_useChosenSet = use;
 }

@@ -31,6 +31,8 @@ public:
     const std::vector<std::string>& Options() const { return m_options; }
     // Index of the option whose text is exactly `text`; -1 for none.
     int FindOption(const std::string& text) const;
+    // What a drop-down offers: the options, or "False" and "True" for a bool without its own.
+    std::vector<std::string> ChoiceTexts() const;
 
     // Several chosen options, for editors that tick more than one.
     void UseChosenSet(bool use);
