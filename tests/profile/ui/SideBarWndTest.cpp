@@ -267,8 +267,11 @@ TEST_F(SideBarSets, GridShowsCommonValuesAndAnEditReachesEverySet) {
     ParameterGrid* grid = m_bar->Grid();
     const PropertyIterator ab = grid->FindById(FindParameterIndex("ab"));
     ASSERT_TRUE(ab.IsValid());
-    grid->SetValueText(ab, "256");
-    grid->OnPropertyChanged(ab);
+    // Typed into the row's editor in the advanced mode, committed as a loss of focus would.
+    wxCommandEvent press(wxEVT_BUTTON, sidebar::kAdvanced);
+    m_bar->GetEventHandler()->ProcessEvent(press);
+    grid->Select(ab);
+    ASSERT_TRUE(grid->CommitEditText("256"));
     EXPECT_EQ(m_first->GetValue("ab"), "256");
     EXPECT_EQ(m_second->GetValue("ab"), "256");
     EXPECT_EQ(m_bar->GetCurrentProfile()->GetValue("ab"), "256");
