@@ -5,6 +5,7 @@
 
 #include "profile/ui/ParameterGrid.h"
 #include "profile/ui/SaveProfileDlg.h"
+#include "resources/Language.h"
 #include "shell/AppConfig.h"
 #include "shell/MainHub.h"
 #include "skin/SkinLabels.h"
@@ -245,6 +246,29 @@ TEST_F(SideBarTest, UserProfilesSurviveARestartThroughSaveAsRenameAndDelete) {
     Start();
     EXPECT_EQ(m_bar->GetProfileCount(), 3);
     EXPECT_EQ(m_bar->FindProfileByPath(path), -1);
+}
+
+TEST_F(SideBarTest, LanguageChangeRenamesEntriesAndKeepsTheSelection) {
+    const std::string system = "IsSysProfile = yes\r\n";
+    ClosePackage(SystemPath("x.pf"));
+    WritePackage({{"profile/", ""},
+                  {"profile/mp3.pf", PfText("MP3 Audio", "mp3", "mp3", kEntries,
+                                            system + "name_de = MP3 Deutsch\r\n")},
+                  {"profile/ogg.pf", PfText("OGG Vorbis", "ogg", "ogg", kEntries, system)},
+                  {"lang/", ""},
+                  {"lang/Deutsch.lang", "CODEPAGE=65001\nLANGCODE=de\n#015E# \"Bitrate\"\n"}});
+    Start();
+    const int mp3 = m_bar->FindProfileByPath(SystemPath("mp3.pf"));
+    ASSERT_EQ(mp3, 1);
+    m_bar->SelectIndex(mp3, true);
+    EXPECT_EQ(StateLine("bitrate").substr(0, 18), "Bit Rate: 128 kb/s");
+
+    ASSERT_TRUE(g_Language.Init(m_base, "Deutsch"));
+    m_bar->OnLanguageChanged();
+    EXPECT_EQ(StateLine("profile"), "MP3 Deutsch  (*.mp3)");
+    EXPECT_EQ(m_bar->GetSelectedIndex(), mp3);
+    EXPECT_EQ(StateLine("bitrate").substr(0, 17), "Bitrate: 128 kb/s");
+    g_Language.Init(m_base, "English");
 }
 
 class SideBarSets : public SideBarTest {
