@@ -532,6 +532,17 @@ void CSideBarWnd::OnSliderReleased(int id) {
     }
 }
 
+void CSideBarWnd::ShowRipRow(const RipRowValues& row) {
+    const std::vector<ParameterSet*> sets = m_grid->Sets();
+    if (IMainHub* hub = GetMainHub()) {
+        hub->EditSets([&] { ApplyRipRow(sets, row); });
+    } else {
+        ApplyRipRow(sets, row);
+    }
+    RefreshTexts();
+    m_grid->Rebuild();
+}
+
 void CSideBarWnd::OnChannelsChosen() {
     m_values.channels = ChannelsText(m_channels->GetSelection());
     OnSliderReleased(kChannels);

@@ -79,6 +79,8 @@ public:
     void SetBitRateAllowed(bool allowed);
     void OnWorkModeChanged(int mode);
     void SetGridEditable(bool editable);
+    // One row of the rip list into the grid's sets (the rip panel passes the row's fields).
+    void ShowRipRow(const RipRowValues& row);
 
     int GetProfileCount() const { return m_catalogue.Count(); }
     Profile* GetProfileAt(int index) const { return m_catalogue.At(index); }
