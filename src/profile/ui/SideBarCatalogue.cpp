@@ -271,8 +271,17 @@ void CSideBarWnd::ShowProfileMenu() {
         add(id);
     menu.Enable(kCmdRename, !system);
     menu.Enable(kCmdDelete, !system);
+    // The menu's right edge goes to the button's lower right corner. A menu tells no width
+    // before it opens, so it is estimated from its widest text and the usual item padding.
+    wxClientDC dc(this);
+    dc.SetFont(wxSystemSettings::GetFont(wxSYS_DEFAULT_GUI_FONT));
+    int widest = 0;
+    for (const wxMenuItem* item : menu.GetMenuItems()) {
+        widest = std::max(widest, dc.GetTextExtent(item->GetItemLabelText()).x);
+    }
     const wxRect button = m_saveButton->GetRect();
-    PopupMenu(&menu, wxPoint(button.GetLeft(), button.GetBottom()));
+    PopupMenu(&menu, wxPoint(button.GetRight() + 1 - (widest + 4 * dc.GetCharWidth()),
+                             button.GetBottom() + 1));
 }
 
 bool CSideBarWnd::RunNameDialog(CSaveProfileDlg& dialog) {
