@@ -32,13 +32,6 @@ public:
     bool operator==(const PropertyIterator& other) const = default;
 
 private:
-    void LayoutBands();
-    wxRect HelpPaneRect() const;
-    void PaintHelpPane();
-    void OnGripMouse(wxMouseEvent& event);
-    // The node behind an iterator of this control's tree; null for any other.
-    PropertyNode* NodeOf(const PropertyIterator& item) const;
-
     PropertyTree* m_tree = nullptr;
     PropertyNode* m_node = nullptr;
 };
