@@ -190,6 +190,22 @@ TEST_F(SideBarTest, CatalogueLoadsTheLastProfileFirstAndLeavesOutUnadmittedForma
     EXPECT_GT(m_bar->DropDownWidth(), 0);
 }
 
+TEST_F(SideBarTest, FirstStartTakesTheFallBackAndStoresIt) {
+    GetAppConfig().SetString("last_profile_path", "");
+    Start();
+    EXPECT_EQ(GetAppConfig().GetString("last_profile_path", nullptr, "x"), SystemPath("mp3.pf"));
+    EXPECT_EQ(m_bar->GetProfileAt(0)->GetName(), "MP3 Audio");
+
+    // The rip mode has a path of its own; an empty one is the fall-back too, and is stored.
+    GetAppConfig().SetInt("last_run_function", 1);
+    GetAppConfig().SetString("last_profile_path", SystemPath("ogg.pf").c_str());
+    GetAppConfig().SetString("lastcd_profile_path", "");
+    Start();
+    EXPECT_EQ(GetAppConfig().GetString("lastcd_profile_path", nullptr, "x"), SystemPath("mp3.pf"));
+    EXPECT_EQ(m_bar->GetProfileAt(0)->GetName(), "MP3 Audio");
+    EXPECT_EQ(m_bar->GetProfileCount(), 3);
+}
+
 TEST_F(SideBarTest, UserProfilesSurviveARestartThroughSaveAsRenameAndDelete) {
     Start();
     const int mp3 = m_bar->FindProfileByPath(SystemPath("mp3.pf"));
