@@ -60,6 +60,8 @@ public:
     wxColour GetGridLineColor() const;
     void SetBackgroundColour2(const wxColour& background, const wxColour& commentBackground);
     void SetTreeFont(const wxFont& font);
+    // Lines the drop-down list of a list editor shows before it scrolls; at least 2.
+    void SetListLines(int lines);
 
     PropertyIterator AddCategory(int id, const std::string& label, const std::string& help);
     // `parent` is a category or an item; `editorName` names a registered editor ("edit",
@@ -114,6 +116,13 @@ public:
     PropertyTree* Tree() const { return m_tree; }
 
 private:
+    void LayoutBands();
+    wxRect HelpPaneRect() const;
+    void PaintHelpPane();
+    void OnGripMouse(wxMouseEvent& event);
+    // The node behind an iterator of this control's tree; null for any other.
+    PropertyNode* NodeOf(const PropertyIterator& item) const;
+
     PropertyTree* m_tree = nullptr;
     // The implementation keeps the rest (editors, help pane, grip drag) out of this header.
     struct Impl;

@@ -1,0 +1,256 @@
+// The side bar's look and place: the skin's pictures, fonts and colours, the stacking of the
+// controls, and which group shows in which mode.
+#include "profile/ui/ParameterGrid.h"
+#include "profile/ui/SideBarWnd.h"
+
+#include "shell/AppConfig.h"
+#include "shell/MainHub.h"
+#include "skin/SkinControls.h"
+#include "skin/SkinLabels.h"
+#include "skin/SkinPicture.h"
+
+#include <wx/choice.h>
+#include <wx/textctrl.h>
+
+#include <algorithm>
+
+namespace ac {
+
+using namespace sidebar;
+
+namespace {
+
+constexpr int kLabelHeight = 18;
+constexpr int kSliderHeight = 28;
+constexpr int kEditHeight = 26;
+
+}  // namespace
+
+bool CSideBarWnd::OnSkinChanged(const std::string& skinDir) {
+    ImSkinPanel::OnSkinChanged(skinDir);
+    const char* section = GetSkinSection();
+    const wxColour panelBg = Look().childBg;
+    const wxColour propertyBg =
+        m_skin.GetString("PropertyBgColor", "", section).empty()
+            ? *wxWHITE
+            : NativeColour(m_skin.GetRgbColour("PropertyBgColor", 0, section));
+    const wxColour commentBg =
+        m_skin.GetString("CommentBgColor", "", section).empty()
+            ? panelBg
+            : NativeColour(m_skin.GetRgbColour("CommentBgColor", 0, section));
+    m_grid->SetBackgroundColour2(propertyBg, commentBg);
+    if (!m_skin.GetString("GridLineColor", "", section).empty()) {
+        m_grid->SetGridLineColor(NativeColour(m_skin.GetRgbColour("GridLineColor", 0, section)),
+                                 true);
+    }
+    auto picture = [&](const char* key) {
+        return LoadSkinPicture(m_skin.GetString(key, "", section));
+    };
+    const wxFont titleFont = MakeSkinFont(m_skin.GetFont(section, "Title"));
+    const wxFont font = MakeSkinFont(m_skin.GetFont(section));
+    const wxColour titleColour = NativeColour(m_skin.GetRgbColour("TitleTextColor", 0, section));
+    const wxColour textColour = NativeColour(m_skin.GetRgbColour("TextColor", 0, section));
+    m_profileLabel->SetFont(titleFont);
+    m_profileLabel->SetTextColour(titleColour);
+    for (ImLabel* label :
+         {m_bitRateLabel, m_sampleRateLabel, m_channelsLabel, m_volumeLabel, m_volumeNameLabel}) {
+        label->SetFont(font);
+        label->SetTextColour(textColour);
+    }
+    for (ImLabel* label : m_discLabels) {
+        label->SetFont(font);
+        label->SetTextColour(textColour);
+    }
+    for (ImLabel* label : m_discLabels)
+        label->SetBgColor(panelBg);
+    for (ImLabel* label : {m_profileLabel, m_bitRateLabel, m_sampleRateLabel, m_channelsLabel,
+                           m_volumeLabel, m_volumeNameLabel}) {
+        label->SetBgColor(panelBg);
+    }
+    for (ImTickSlider* slider : {m_bitRateSlider, m_sampleRateSlider, m_volumeSlider}) {
+        slider->SetPictures(picture("SliderFore"), picture("SliderGone"), picture("SliderBlock"),
+                            picture("SliderBlockDisable"), picture("SliderBg"));
+        slider->SetColours(panelBg, textColour);
+        slider->SetFont(font);
+    }
+    m_balance->SetFaces(picture("CheckBox_Unchecked"), picture("CheckBox_Checked"));
+    m_balance->SetColours(textColour, wxColour(0x80, 0x80, 0x80));
+    m_balance->SetFont(font);
+    m_advancedButton->SetPicture(LoadSkinPicture("mode_nor.bmp"));
+    m_simpleButton->SetPicture(LoadSkinPicture("mode_adv.bmp"));
+    m_saveButton->SetPicture(LoadSkinPicture("ProfileMenu.bmp"));
+    for (ImButton* button : {m_advancedButton, m_simpleButton, m_saveButton}) {
+        // Bitmap buttons: the picture says it, the text is only the fall-back.
+        button->SetTextShown(button->CellHeight() == 0);
+        button->SetTextColours(Look().buttonText);
+        button->SetFont(font);
+    }
+    RecalcLayout();
+    Refresh();
+    return true;
+}
+
+// ---- Layout ----
+
+void CSideBarWnd::RecalcLayout() {
+    ImSkinDialog::RecalcLayout();
+    if (m_grid == nullptr)
+        return;
+    const wxSize client = GetClientSize();
+    const int left = m_metrics.LeftMargin;
+    const int width = std::max(40, client.x - left - m_metrics.RightMargin);
+    int y = m_metrics.TopMargin;
+
+    auto buttonSize = [](ImButton* button, wxSize fallback) {
+        const wxSize cell = button->CellSize();
+        return cell.x > 0 && cell.y > 0 ? cell : fallback;
+    };
+    const wxSize simpleSize = buttonSize(m_simpleButton, wxSize(56, 20));
+    const wxSize advancedSize = buttonSize(m_advancedButton, wxSize(64, 20));
+    const int rowHeight = std::max({kLabelHeight, simpleSize.y, advancedSize.y});
+    int x = left + width - simpleSize.x;
+    m_simpleButton->SetSize(x, y, simpleSize.x, simpleSize.y);
+    x -= m_metrics.HSpacing + advancedSize.x;
+    m_advancedButton->SetSize(x, y, advancedSize.x, advancedSize.y);
+    m_profileLabel->SetSize(left, y, std::max(20, x - left - m_metrics.HSpacing), rowHeight);
+    y += rowHeight + m_metrics.VSpacing;
+
+    const wxSize saveSize = buttonSize(m_saveButton, wxSize(28, 26));
+    const int selectorHeight = std::max(saveSize.y, m_profileSelector->GetBestSize().y);
+    const int selectorWidth = std::max(20, width - saveSize.x - m_metrics.HSpacing);
+    m_profileSelector->SetSize(left, y, selectorWidth, selectorHeight);
+    m_discType->SetSize(left, y, selectorWidth, selectorHeight);
+    m_saveButton->SetSize(left + width - saveSize.x, y + (selectorHeight - saveSize.y) / 2,
+                          saveSize.x, saveSize.y);
+    y += selectorHeight + m_metrics.VSpacing;
+
+    const int rightMargin = m_skin.GetInt("PropertyRightMargin", 0, GetSkinSection());
+    m_grid->SetSize(left, y, std::max(40, client.x - left - rightMargin),
+                    std::max(40, client.y - y - m_metrics.BottomMargin));
+    LayoutSimpleGroup(left, y, width);
+    LayoutDiscGroup(left, y, width);
+}
+
+void CSideBarWnd::LayoutSimpleGroup(int x, int y, int width) {
+    const std::pair<ImLabel*, ImTickSlider*> rows[] = {{m_bitRateLabel, m_bitRateSlider},
+                                                       {m_sampleRateLabel, m_sampleRateSlider},
+                                                       {m_volumeLabel, m_volumeSlider}};
+    for (const auto& [label, slider] : rows) {
+        label->SetSize(x, y, width, kLabelHeight);
+        y += kLabelHeight;
+        slider->SetSize(x, y, width, kSliderHeight);
+        y += kSliderHeight + m_metrics.VSpacing;
+    }
+    m_channelsLabel->SetSize(x, y, width, kLabelHeight);
+    y += kLabelHeight;
+    m_channels->SetSize(x, y, width, std::max(kEditHeight, m_channels->GetBestSize().y));
+    y += m_channels->GetSize().y + 2 * m_metrics.VSpacing;
+    m_volumeNameLabel->SetSize(x, y, width, kLabelHeight);
+    y += kLabelHeight;
+    m_volumeName->SetSize(x, y, width, kEditHeight);
+}
+
+void CSideBarWnd::LayoutDiscGroup(int x, int y, int width) {
+    for (wxWindow* window : m_discGroup) {
+        const bool isLabel = dynamic_cast<ImLabel*>(window) != nullptr;
+        const int height = isLabel ? kLabelHeight : std::max(kEditHeight, window->GetBestSize().y);
+        window->SetSize(x, y, width, height);
+        y += height + (isLabel ? 0 : m_metrics.VSpacing);
+    }
+}
+
+// ---- Modes ----
+
+void CSideBarWnd::ShowGroup(const std::vector<wxWindow*>& group, bool show) {
+    for (wxWindow* window : group)
+        window->Show(show);
+}
+
+void CSideBarWnd::ApplyMode(bool advanced) {
+    const bool audioCd = [&] {
+        if (m_firstShow) {
+            m_firstShow = false;
+            m_workMode = GetAppConfig().GetInt("last_run_function", nullptr, 0);
+        } else {
+            m_workMode = CurrentWorkMode();
+        }
+        return m_workMode == 2 && GetDiscType() == 0;
+    }();
+    if (advanced) {
+        ShowGroup(m_simpleGroup, false);
+        ShowGroup(m_discGroup, false);
+        m_volumeNameLabel->Hide();
+        m_volumeName->Hide();
+        m_grid->Show();
+        return;
+    }
+    m_grid->Hide();
+    if (audioCd) {
+        ShowGroup(m_discGroup, true);
+        ShowGroup(m_simpleGroup, false);
+        m_volumeNameLabel->Hide();
+        m_volumeName->Hide();
+        m_advancedButton->Enable(false);
+        m_simpleButton->Enable(false);
+        return;
+    }
+    ShowGroup(m_simpleGroup, true);
+    ShowGroup(m_discGroup, false);
+    m_volumeNameLabel->Hide();
+    m_volumeName->Hide();
+    m_advancedButton->Enable(!m_advanced);
+    m_simpleButton->Enable(m_advanced);
+}
+
+void CSideBarWnd::OnAdvancedPressed(bool advanced) {
+    m_advanced = advanced;
+    ApplyMode(advanced);
+    m_advancedButton->Enable(!advanced);
+    m_simpleButton->Enable(advanced);
+    if (!advanced) {
+        const bool discName = m_workMode == 2 && GetDiscType() != 0;
+        m_volumeNameLabel->Show(discName);
+        m_volumeName->Show(discName);
+    }
+}
+
+void CSideBarWnd::OnWorkModeChanged(int mode) {
+    m_firstShow = false;
+    m_workMode = mode;
+    const bool burn = mode == 2;
+    m_profileSelector->Show(!burn);
+    m_discType->Show(burn);
+    m_profileSelector->Enable(!burn);
+    if (burn) {
+        SelectDiscType(GetDiscType());
+    } else {
+        ApplyMode(m_advanced);
+    }
+    m_grid->Rebuild();
+    RefreshTexts();
+}
+
+int CSideBarWnd::GetDiscType() const {
+    const int type = m_discType->GetSelection();
+    return type == wxNOT_FOUND ? 0 : type;
+}
+
+void CSideBarWnd::SelectDiscType(int type) {
+    m_discType->SetSelection(std::clamp(type, 0, 2));
+    type = GetDiscType();
+    if (type == 0 || !m_advanced) {
+        ApplyMode(false);
+        if (type != 0) {
+            m_volumeNameLabel->Show();
+            m_volumeName->Show();
+        }
+    } else {
+        ApplyMode(true);
+    }
+    static const char* const kFormats[] = {"wav", "mp3", "wma"};
+    const int index = m_catalogue.FindSystemByExt(kFormats[type]);
+    if (index >= 0)
+        SelectIndex(index, true);
+}
+
+}  // namespace ac
