@@ -94,6 +94,10 @@ void CMediaListWnd::SelectOnly(int row) {
             m_rows[i]->selected = static_cast<int>(i) == row;
         }
     }
+    if (wxThread::IsMain()) {
+        ApplySelectOnly(row);
+        return;
+    }
     PostToUi([row](CMediaListWnd& self) { self.ApplySelectOnly(row); });
 }
 
