@@ -9,11 +9,14 @@
 #include "profile/ParameterSet.h"
 #include "shell/AppConfig.h"
 #include "shell/MainHub.h"
+#include "resources/Language.h"
 #include "skin/ListCtrl.h"
+#include "skin/SkinManager.h"
 #include "skin/UiQueueWx.h"
 
 #include <wx/app.h>
 #include <wx/frame.h>
+#include <wx/image.h>
 #include <wx/init.h>
 
 #include <gtest/gtest.h>
@@ -21,6 +24,7 @@
 #include <atomic>
 #include <chrono>
 #include <filesystem>
+#include <map>
 #include <sstream>
 #include <thread>
 
@@ -98,10 +102,13 @@ protected:
         ASSERT_TRUE(wxEntryStart(argc, argv));
         ASSERT_TRUE(wxTheApp->CallOnInit());
         InstallWxUiQueue();
+        wxInitAllImageHandlers();  // the skin's buttons are PNG pictures
     }
     static void TearDownTestSuite() { wxEntryCleanup(); }
 
     void SetUp() override {
+        // Panels register with the skin manager for good; each case starts with no listeners.
+        g_Skin.Reset();
         SetMainHub(&m_hub);
         m_frame = new wxFrame(nullptr, wxID_ANY, "list", wxDefaultPosition, wxSize(700, 500));
         m_output = new COutputPanelWnd(m_frame);
@@ -113,6 +120,7 @@ protected:
     void TearDown() override {
         m_frame->Destroy();
         wxTheApp->ProcessPendingEvents();
+        g_Skin.Reset();
         SetMainHub(nullptr);
     }
 
@@ -380,6 +388,36 @@ TEST_F(MediaListWindowTest, DriverThreadReadsTheListWhileRowsComeAndGo) {
     EXPECT_EQ(Rows().size(), 34u);
     m_list->Clear();
     EXPECT_EQ(m_list->GetRowCount(), 0);
+}
+
+TEST_F(MediaListWindowTest, SkinnedButtonRowStandsAroundEncode) {
+    ASSERT_TRUE(g_Language.Init(AC_BIN_DIR, "English"));
+    g_Skin.SetRoot(std::string(AC_BIN_DIR) + "\\Skin");
+    ASSERT_TRUE(g_Skin.SetSkin("Default"));
+    m_list->AddFile(Wav("a.wav"), -1);
+    m_list->SetSize(0, 0, 700, 400);
+    std::map<int, wxRect> at;
+    for (int id : {1002, 1003, 1004, 1034, 1009, 1012, 1225, 1226, 1001}) {
+        wxWindow* child = id == 1001 ? m_list->List() : m_list->FindWindow(id);
+        at[id] = child->GetRect();
+    }
+    ASSERT_GT(at[1034].width, 0);
+    const int rowMiddle = (at[1225].GetRight() + 1 + at[1226].x) / 2;
+    EXPECT_NEAR(at[1034].x + at[1034].width / 2, rowMiddle + 30, 1);
+    EXPECT_EQ(at[1003].x, at[1002].GetRight() + 1 + 25);
+    EXPECT_EQ(at[1004].x, at[1003].GetRight() + 1 + 25);
+    EXPECT_EQ(at[1034].x, at[1004].GetRight() + 1 + 25);
+    EXPECT_EQ(at[1009].x, at[1034].GetRight() + 1 + 25);
+    EXPECT_EQ(at[1012].x, at[1009].GetRight() + 1 + 10);
+    const int pictureMiddle = at[1225].y + at[1225].height / 2;
+    for (int id : {1002, 1034, 1012}) {
+        EXPECT_NEAR(at[id].y + at[id].height / 2, pictureMiddle, 1) << id;
+    }
+    EXPECT_EQ(at[1001].x, 2);
+    EXPECT_EQ(at[1001].width, 700 - 4);
+    EXPECT_LE(at[1001].GetBottom(), at[1225].y);
+    EXPECT_EQ(m_list->List()->Columns()[kColName].width,
+              m_list->List()->Body()->GetClientSize().x - 316);
 }
 
 TEST_F(MediaListWindowTest, OutputPanelKeepsAFolderPerModeAndTrimsIt) {

@@ -2,6 +2,7 @@
 // the one-second timer.
 #include "convert/RowParameters.h"
 #include "medialist/MediaListRules.h"
+#include "medialist/ui/IconButton.h"
 #include "medialist/ui/MediaListWnd.h"
 #include "profile/ParameterSet.h"
 #include "resources/Language.h"
@@ -353,10 +354,8 @@ void CMediaListWnd::RecalcLayout() {
     std::array<wxSize, 6> sizes;
     int rowHeight = std::max(m_leftEnd->GetSize().y, m_rightEnd->GetSize().y);
     for (std::size_t i = 0; i < kButtons.size(); ++i) {
-        sizes[i] = m_buttons[i]->CellSize();
-        if (sizes[i].x <= 0 || sizes[i].y <= 0) {
-            sizes[i] = wxSize(64, 24);
-        }
+        FitIconButton(*m_buttons[i], 24);
+        sizes[i] = m_buttons[i]->GetSize();
         rowHeight = std::max(rowHeight, sizes[i].y);
     }
     const int rowTop = client.y - m_metrics.BottomMargin - rowHeight;

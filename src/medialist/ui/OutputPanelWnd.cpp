@@ -2,6 +2,7 @@
 
 #include "convert/OutputNaming.h"
 #include "medialist/MediaListRules.h"
+#include "medialist/ui/IconButton.h"
 #include "platform/Paths.h"
 #include "resources/Language.h"
 #include "resources/TextFormat.h"
@@ -259,8 +260,7 @@ void COutputPanelWnd::RecalcLayout() {
         FitLabel(label);
     }
     for (ImButton* button : {m_browse, m_open}) {
-        const wxSize cell = button->CellSize();
-        button->SetSize(cell.x > 0 ? cell : wxSize(75, height));
+        FitIconButton(*button, height);
     }
     const int gap = m_metrics.HSpacing;
     if (burn) {
