@@ -83,6 +83,7 @@ public:
     const Profile* GetCurrentProfile() const { return m_currentProfile; }
     std::vector<ParameterSet*> SelectedSets();
     // Runs `edit` under the list lock, then lets the selected rows read their cut again.
+    // `edit` writes sets only: a call back into the list from it would wait on its own lock.
     void EditSets(const std::function<void()>& edit);
     void SetSelectedVolume(int volume, bool firstOnly);
     int GetFirstSelected();
