@@ -184,6 +184,10 @@ int COutputPanelWnd::GetCopies() const {
 }
 
 void COutputPanelWnd::SetMode(int mode) {
+    if (mode < 0 || mode > 2) {
+        ShowBox(this, g_Language.GetString(0xC061), wxOK | wxICON_ERROR);
+        return;
+    }
     m_showType = mode;
     GetAppConfig().SetInt("last_run_function", mode);
     ShowModeFolder();
@@ -242,10 +246,6 @@ void COutputPanelWnd::RecalcLayout() {
     const wxRect row(m_metrics.LeftMargin, std::max(0, (client.y - height) / 2),
                      std::max(0, client.x - m_metrics.LeftMargin - m_metrics.RightMargin), height);
     const bool burn = m_showType == 2;
-    if (m_showType < 0 || m_showType > 2) {
-        ShowBox(this, g_Language.GetString(0xC061), wxOK | wxICON_ERROR);
-        return;
-    }
     for (wxWindow* w : {static_cast<wxWindow*>(m_destinationLabel), static_cast<wxWindow*>(m_directory),
                         static_cast<wxWindow*>(m_browse), static_cast<wxWindow*>(m_open)}) {
         w->Show(!burn);
