@@ -23,7 +23,9 @@ for i in $(seq -w 1 1000); do cp "$work/one.wav" "$work/files/f$i.wav"; done
 median() { sort -n | awk '{v[NR]=$1} END {if (NR % 2) print v[(NR+1)/2]; else print (v[NR/2]+v[NR/2+1])/2}'; }
 : > "$work/list.log"; : > "$work/probe.log"
 for ((r = 0; r < repeats; r++)); do
-  "$bin/medialist_add_bench" "$work/files" "$bin" 10 | sed -n 's/^add_ms //p' >> "$work/list.log"
+  "$bin/medialist_add_bench" "$work/files" "$bin" 10 > "$work/run.txt"
+  [ "$(sed -n 's/^rows //p' "$work/run.txt")" = 1000 ] || { echo "the list did not take 1000 rows" >&2; exit 1; }
+  sed -n 's/^add_ms //p' "$work/run.txt" >> "$work/list.log"
   start=$(date +%s%N)
   "$bin/acprobe" "$work/files"/* > /dev/null
   echo $(( ($(date +%s%N) - start) / 1000000 )) >> "$work/probe.log"
