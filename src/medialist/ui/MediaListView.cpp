@@ -1,0 +1,385 @@
+// The conversion list's window side: controls, skin, layout, the status cells, the mouse and
+// the one-second timer.
+#include "convert/RowParameters.h"
+#include "medialist/MediaListRules.h"
+#include "medialist/ui/IconButton.h"
+#include "medialist/ui/MediaListWnd.h"
+#include "profile/ParameterSet.h"
+#include "resources/Language.h"
+#include "shell/MainHub.h"
+#include "skin/ListCtrl.h"
+#include "skin/SkinGeometry.h"
+#include "skin/SkinLabels.h"
+#include "skin/WindowTranslation.h"
+
+#include <wx/dnd.h>
+#include <wx/settings.h>
+
+#include <algorithm>
+
+namespace ac {
+
+namespace {
+
+constexpr int kListId = 1001;
+struct ButtonDef {
+    int id;
+    const char* text;
+    const char* picture;
+};
+// Left to right as they stand in the row.
+constexpr std::array<ButtonDef, 6> kButtons = {{{1002, "Add", "add.png"},
+                                                {1003, "Remove", "remove.png"},
+                                                {1004, "Clear", "clear.png"},
+                                                {1034, "Encode", "encode.png"},
+                                                {1009, "Pause", "pause.png"},
+                                                {1012, "Stop", "stop.png"}}};
+constexpr int kEncode = 3;
+
+struct ColumnDef {
+    std::uint32_t textId;
+    const char* text;
+    int width;
+};
+constexpr std::array<ColumnDef, 6> kColumns = {{{0, "", 32},
+                                                {106, "Name", 200},
+                                                {107, "Duration", 76},
+                                                {108, "Type", 40},
+                                                {109, "Target", 96},
+                                                {110, "Status", 72}}};
+constexpr int kFixedColumnsWidth = 316;
+
+// XListCtrl offers no setter for a column once inserted; its columns are plain records.
+XListColumn& ColumnOf(XListCtrl& list, int column) {
+    return const_cast<std::vector<XListColumn>&>(list.Columns())[std::size_t(column)];
+}
+
+wxColour StatusColour(JobStatus status, const wxColour& normal) {
+    switch (status) {
+        case JobStatus::Failed:
+        case JobStatus::Aborted: return {128, 0, 0};
+        case JobStatus::Completed: return {0, 128, 0};
+        case JobStatus::UnknownFile: return {128, 128, 128};
+        default: return normal;
+    }
+}
+
+std::string StatusText(JobStatus status) {
+    if (status == JobStatus::Idle) {
+        return "-";
+    }
+    const std::uint32_t id = StatusTextId(status);
+    return id != 0 ? g_Language.GetString(id) : std::string();
+}
+
+class ListDropTarget : public wxFileDropTarget {
+public:
+    explicit ListDropTarget(CMediaListWnd& list) : m_list(list) {}
+    bool OnDropFiles(wxCoord, wxCoord, const wxArrayString& names) override {
+        std::vector<std::string> paths;
+        for (const wxString& name : names) {
+            paths.push_back(name.utf8_string());
+        }
+        m_list.OnDropFiles(paths);
+        return true;
+    }
+
+private:
+    CMediaListWnd& m_list;
+};
+
+wxWindow* HeaderOf(XListCtrl& list) {
+    for (wxWindow* child : list.GetChildren()) {
+        if (child != list.Body()) {
+            return child;
+        }
+    }
+    return nullptr;
+}
+
+}  // namespace
+
+void CMediaListWnd::CreateControls() {
+    m_list = new XListCtrl(this, kListId);
+    for (std::size_t i = 0; i < kColumns.size(); ++i) {
+        m_list->InsertColumn(static_cast<int>(i), kColumns[i].text, kColumns[i].width, i == 0);
+    }
+    for (std::size_t i = 0; i < kButtons.size(); ++i) {
+        m_buttons[i] = new ImButton(this, kButtons[i].id, kButtons[i].text);
+    }
+    m_leftEnd = new ImPicture(this, 1225);
+    m_rightEnd = new ImPicture(this, 1226);
+    m_cellText = wxSystemSettings::GetColour(wxSYS_COLOUR_WINDOWTEXT);
+    SetDropTarget(new ListDropTarget(*this));
+    m_list->Body()->SetDropTarget(new ListDropTarget(*this));
+}
+
+void CMediaListWnd::BindEvents() {
+    Bind(wxEVT_TIMER, [this](wxTimerEvent&) { OnTimer(); }, 1);
+    Bind(wxEVT_BUTTON, [this](wxCommandEvent& event) { OnButton(event.GetId()); });
+    Bind(EVT_XLIST_HEADER_CHECK, [this](wxCommandEvent& event) {
+        if (event.GetInt() != kColCheck) {
+            return;
+        }
+        const bool check = event.GetExtraLong() == 2;
+        std::lock_guard model(m_modelMutex);
+        for (auto& row : m_rows) {
+            row->checked = check;
+        }
+    });
+    wxWindow* body = m_list->Body();
+    body->Bind(wxEVT_LEFT_DOWN, &CMediaListWnd::OnBodyLeftDown, this);
+    body->Bind(wxEVT_KEY_DOWN, [this](wxKeyEvent& event) {
+        event.Skip();
+        CallAfter([this] { SyncSelection(); });
+    });
+    body->Bind(wxEVT_LEFT_DCLICK, [](wxMouseEvent&) {
+        if (IMainHub* hub = GetMainHub()) {
+            hub->PostCommand(33045);
+        }
+    });
+    body->Bind(wxEVT_RIGHT_DOWN, [this](wxMouseEvent& event) {
+        const int row = m_list->Body()->VirtualHitTest(event.GetY());
+        if (row != wxNOT_FOUND && row < m_list->GetItemCount() && !m_list->IsSelected(row)) {
+            m_list->SelectRow(row);
+            SyncSelection();
+        }
+        if (IMainHub* hub = GetMainHub()) {
+            hub->ShowContextMenu(this, kMediaListContextMenuId);
+        }
+    });
+    if (wxWindow* header = HeaderOf(*m_list)) {
+        header->Bind(wxEVT_LEFT_DOWN, &CMediaListWnd::OnHeaderLeftDown, this);
+    }
+}
+
+void CMediaListWnd::OnBodyLeftDown(wxMouseEvent& event) {
+    const int row = m_list->Body()->VirtualHitTest(event.GetY());
+    if (row != wxNOT_FOUND && row < m_list->GetItemCount() &&
+        event.GetX() < m_list->Columns()[kColCheck].width) {
+        // The box is centred in its cell; across the row's height any point of its span counts.
+        const SkinRect box = ListCheckBox({0, 0, m_list->Columns()[kColCheck].width, 17}, false);
+        const XListCell* cell = m_list->Cell(row, kColCheck);
+        if (event.GetX() >= box.x && event.GetX() < box.x + box.w) {
+            if (cell->bEnabled) {
+                SetRowChecked(row, cell->nCheckedState != 1);
+            }
+            return;
+        }
+    }
+    event.Skip();
+    // The list changes its selection in its own handler, which runs after this one.
+    CallAfter([this] { SyncSelection(); });
+}
+
+void CMediaListWnd::OnHeaderLeftDown(wxMouseEvent& event) {
+    if (m_checkingEnabled) {
+        event.Skip();
+    }
+}
+
+void CMediaListWnd::SyncSelection() {
+    int becameSelected = -1;
+    bool lostAny = false;
+    {
+        std::lock_guard model(m_modelMutex);
+        for (std::size_t i = 0; i < m_rows.size(); ++i) {
+            const bool now = m_list->IsSelected(static_cast<int>(i));
+            if (now != m_rows[i]->selected.exchange(now)) {
+                if (now) {
+                    becameSelected = static_cast<int>(i);
+                } else {
+                    lostAny = true;
+                }
+            }
+        }
+    }
+    NotifySelection(becameSelected, lostAny);
+}
+
+void CMediaListWnd::NotifySelection(int becameSelected, bool lostAny) {
+    IMainHub* hub = GetMainHub();
+    if (hub == nullptr || (becameSelected < 0 && !lostAny)) {
+        return;
+    }
+    hub->OnListSelectionChanged(becameSelected);
+    if (becameSelected >= 0) {
+        ApplyBitRateRule();
+    }
+    UpdateButtons();
+}
+
+void CMediaListWnd::ApplyBitRateRule() {
+    IMainHub* hub = GetMainHub();
+    MediaItem* item = GetItem(GetFirstSelected());
+    ParameterSet* set = item != nullptr ? SetOf(*item) : nullptr;
+    if (hub != nullptr && set != nullptr) {
+        hub->SetBitRateAllowed(BitRateAllowedFor(set->GetExtName()));
+    }
+}
+
+void CMediaListWnd::DrawStatus(int row) {
+    MediaItem* item = GetItem(row);
+    if (item == nullptr || row >= m_list->GetItemCount()) {
+        return;
+    }
+    const JobStatus status = item->Status();
+    const XListCell* cell = m_list->Cell(row, kColStatus);
+    if (status == JobStatus::Running) {
+        if (!cell->bProgress || !cell->progressFormat.empty()) {
+            m_list->SetProgress(row, kColStatus, true);
+        }
+        m_list->UpdateProgress(row, kColStatus, std::clamp(ProgressPercent(*item), 0, 100));
+    } else if (status == JobStatus::Paused || status == JobStatus::Pending) {
+        m_list->SetProgress(row, kColStatus, true, StatusText(status));
+        if (item->process.load() != nullptr) {
+            m_list->UpdateProgress(row, kColStatus, ProgressPercent(*item));
+        }
+    } else {
+        m_list->DeleteProgress(row, kColStatus);
+        m_list->SetItemText(row, kColStatus, StatusText(status), StatusColour(status, m_cellText));
+    }
+}
+
+void CMediaListWnd::OnTimer() {
+    for (int row = 0; row < m_list->GetItemCount(); ++row) {
+        MediaItem* item = GetItem(row);
+        if (item == nullptr || item->process.load() == nullptr ||
+            item->Status() != JobStatus::Running) {
+            continue;
+        }
+        if (!m_list->Cell(row, kColStatus)->bProgress) {
+            DrawStatus(row);
+        }
+        m_list->UpdateProgress(row, kColStatus, std::clamp(ProgressPercent(*item), 0, 100));
+    }
+    UpdateButtons();
+}
+
+void CMediaListWnd::UpdateButtons() {
+    IMainHub* hub = GetMainHub();
+    static constexpr std::array<int, 6> kCommands = {32771, 32772, 32773, 32776, 32777, 32778};
+    for (std::size_t i = 0; i < kButtons.size(); ++i) {
+        const bool enable = i < kEncode ? IsCommandEnabled(kCommands[i])
+                                        : hub != nullptr && hub->IsCommandEnabled(kCommands[i]);
+        if (m_buttons[i]->IsEnabled() != enable) {
+            m_buttons[i]->Enable(enable);
+        }
+    }
+}
+
+void CMediaListWnd::OnButton(int id) {
+    switch (id) {
+        case 1002: AddFiles(); break;
+        case 1003: Remove(); break;
+        case 1004: Clear(); break;
+        default: {
+            const int command = id == 1034 ? 32776 : id == 1009 ? 32777 : id == 1012 ? 32778 : 0;
+            if (IMainHub* hub = GetMainHub(); hub != nullptr && command != 0) {
+                hub->PostCommand(command);
+            }
+        }
+    }
+}
+
+void CMediaListWnd::FitColumns() {
+    const int width = m_list->Body()->GetClientSize().x;
+    ColumnOf(*m_list, kColName).width = std::max(60, width - kFixedColumnsWidth);
+    m_list->Refresh();
+}
+
+void CMediaListWnd::OnLanguageChanged() {
+    for (std::size_t i = 1; i < kColumns.size(); ++i) {
+        ColumnOf(*m_list, static_cast<int>(i)).text = g_Language.GetString(kColumns[i].textId);
+    }
+    for (std::size_t i = 0; i < kButtons.size(); ++i) {
+        m_buttons[i]->SetLabel(kButtons[i].text);
+    }
+    TranslateWindow(*this, kMediaListDialogId);
+    for (int row = 0; row < m_list->GetItemCount(); ++row) {
+        DrawStatus(row);
+    }
+    m_list->Refresh();
+}
+
+bool CMediaListWnd::OnSkinChanged(const std::string& skinDir) {
+    ImSkinPanel::OnSkinChanged(skinDir);
+    const char* section = GetSkinSection();
+    const wxFont font = MakeSkinFont(m_skin.GetFont(section));
+    m_list->SetFontOfCells(font);
+    m_list->SetRowHeight(m_skin.GetInt("GridHeight", 17, section));
+    m_cellText = NativeColour(m_skin.GetRgbColour("TextColor", 0, section));
+    m_list->SetColours(m_cellText, wxSystemSettings::GetColour(wxSYS_COLOUR_WINDOW),
+                       wxSystemSettings::GetColour(wxSYS_COLOUR_GRAYTEXT),
+                       wxSystemSettings::GetColour(wxSYS_COLOUR_HIGHLIGHT));
+    const int headerColour = m_skin.GetInt("HeaderBgColor", -1, section);
+    if (auto* header = dynamic_cast<ImHeaderCtrl*>(HeaderOf(*m_list)); header && headerColour != -1) {
+        header->SetColors(wxSystemSettings::GetColour(wxSYS_COLOUR_3DHIGHLIGHT),
+                          wxSystemSettings::GetColour(wxSYS_COLOUR_3DSHADOW),
+                          NativeColour(static_cast<std::uint32_t>(headerColour)), m_cellText);
+    }
+    m_list->SetHeaderPicture(LoadSkinPicture(m_skin.GetString("HeaderBack", "", section)),
+                             m_skin.GetInt("HeaderBgMode", 0, section),
+                             m_skin.GetInt("HeadBgTopSplitter", 0, section),
+                             m_skin.GetInt("HeadBgBtmSplitter", 0, section));
+    wxColour colours[4];
+    static const char* const kColourKeys[4] = {"TextColorUp", "TextColorDown", "TextColorActive",
+                                               "TextColorDisabled"};
+    for (int i = 0; i < 4; ++i) {
+        colours[i] = NativeColour(m_skin.GetRgbColour(kColourKeys[i], 0, section));
+    }
+    for (std::size_t i = 0; i < kButtons.size(); ++i) {
+        m_buttons[i]->SetPicture(LoadSkinPicture(kButtons[i].picture));
+        m_buttons[i]->SetFont(font);
+        m_buttons[i]->SetTextColours(colours);
+    }
+    m_leftEnd->SetPicture(LoadSkinPicture("RipLeft.bmp"));
+    m_leftEnd->FitToPicture();
+    m_rightEnd->SetPicture(LoadSkinPicture("RipRight.png"));
+    m_rightEnd->FitToPicture();
+    m_endSpacing = m_skin.GetInt("EncodeButtonHSpacing", m_metrics.HSpacing, section);
+    for (int row = 0; row < m_list->GetItemCount(); ++row) {
+        DrawStatus(row);
+    }
+    RecalcLayout();
+    return true;
+}
+
+void CMediaListWnd::RecalcLayout() {
+    ImSkinDialog::RecalcLayout();
+    if (m_list == nullptr) {
+        return;
+    }
+    const wxSize client = GetClientSize();
+    std::array<wxSize, 6> sizes;
+    int rowHeight = std::max(m_leftEnd->GetSize().y, m_rightEnd->GetSize().y);
+    for (std::size_t i = 0; i < kButtons.size(); ++i) {
+        FitIconButton(*m_buttons[i], 24);
+        sizes[i] = m_buttons[i]->GetSize();
+        rowHeight = std::max(rowHeight, sizes[i].y);
+    }
+    const int rowTop = client.y - m_metrics.BottomMargin - rowHeight;
+    const wxSize left = m_leftEnd->GetSize();
+    const wxSize right = m_rightEnd->GetSize();
+    m_leftEnd->SetSize(m_endSpacing, rowTop + (rowHeight - left.y) / 2, left.x, left.y);
+    m_rightEnd->SetSize(client.x - m_endSpacing - right.x, rowTop + (rowHeight - right.y) / 2,
+                        right.x, right.y);
+    m_list->SetSize(2, 2, std::max(0, client.x - 4), std::max(0, rowTop - 4));
+
+    const int rowLeft = m_endSpacing + left.x;
+    const int rowRight = client.x - m_endSpacing - right.x;
+    std::array<int, 6> x{};
+    x[kEncode] = (rowLeft + rowRight) / 2 + 30 - sizes[kEncode].x / 2;
+    for (int i = kEncode - 1; i >= 0; --i) {
+        x[std::size_t(i)] = x[std::size_t(i) + 1] - 25 - sizes[std::size_t(i)].x;
+    }
+    x[4] = x[3] + sizes[3].x + 25;
+    x[5] = x[4] + sizes[4].x + 10;
+    for (std::size_t i = 0; i < kButtons.size(); ++i) {
+        m_buttons[i]->SetSize(x[i], rowTop + (rowHeight - sizes[i].y) / 2, sizes[i].x,
+                              sizes[i].y);
+    }
+    FitColumns();
+}
+
+}  // namespace ac
