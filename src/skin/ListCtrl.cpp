@@ -27,6 +27,10 @@ wxRect ToWx(const SkinRect& r) {
 std::string ProgressText(const XListCell& cell) {
     char text[64];
     const std::string& format = cell.progressFormat;
+    // A word in place of the percent ("Pause") stands as written.
+    if (!format.empty() && format.find('%') == std::string::npos) {
+        return format;
+    }
     // A caller's format holds one %d at most; anything else falls back to the plain percent.
     if (!format.empty() && std::count(format.begin(), format.end(), '%') <= 3 &&
         format.find("%d") != std::string::npos && format.find("%s") == std::string::npos) {

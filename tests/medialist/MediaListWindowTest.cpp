@@ -314,7 +314,7 @@ TEST_F(MediaListWindowTest, ButtonsAndMouseGoThroughTheHub) {
     wxMouseEvent dclick(wxEVT_LEFT_DCLICK);
     dclick.SetY(300);  // below the last row: an empty part of the list
     m_list->List()->Body()->GetEventHandler()->ProcessEvent(dclick);
-    EXPECT_EQ(m_hub.posted, (std::vector<int>{32776, 32777, 32778, 33045}));
+    EXPECT_EQ(m_hub.posted, (std::vector<int>{1034, 1009, 1012, 33045}));
     wxMouseEvent right(wxEVT_RIGHT_DOWN);
     m_list->List()->Body()->GetEventHandler()->ProcessEvent(right);
     EXPECT_EQ(m_hub.menus, std::vector<int>{kMediaListContextMenuId});

@@ -12,16 +12,13 @@ namespace ac {
 
 // Sizes a button for its picture and label; without a picture, for the label alone.
 inline void FitIconButton(ImButton& button, int minimumHeight) {
-    const wxSize cell = button.CellSize();
-    const wxSize text = button.GetTextExtent(button.GetLabel());
-    if (cell.x <= 0 || cell.y <= 0) {
-        button.SetTextOffset(wxPoint(0, 0));
+    const wxSize fit = button.FitSize();
+    if (fit.x <= 0 || fit.y <= 0) {
+        const wxSize text = button.GetTextExtent(button.GetLabel());
         button.SetSize(text.x + 16, std::max(minimumHeight, text.y + 8));
         return;
     }
-    constexpr int kGap = 3;
-    button.SetTextOffset(wxPoint(cell.x + kGap, 0));
-    button.SetSize(cell.x + kGap + text.x + 4, std::max(cell.y, minimumHeight));
+    button.SetSize(fit.x, std::max(fit.y, minimumHeight));
 }
 
 }  // namespace ac

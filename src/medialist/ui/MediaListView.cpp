@@ -273,12 +273,16 @@ void CMediaListWnd::OnButton(int id) {
         case 1002: AddFiles(); break;
         case 1003: Remove(); break;
         case 1004: Clear(); break;
-        default: {
-            const int command = id == 1034 ? 32776 : id == 1009 ? 32777 : id == 1012 ? 32778 : 0;
-            if (IMainHub* hub = GetMainHub(); hub != nullptr && command != 0) {
-                hub->PostCommand(command);
+        case 1034:
+        case 1009:
+        case 1012:
+            // The main dialog runs them: the Stop button, unlike the menu entry, keeps the run's
+            // end-of-run step, so the button's own id travels.
+            if (IMainHub* hub = GetMainHub()) {
+                hub->PostCommand(id);
             }
-        }
+            break;
+        default: break;
     }
 }
 

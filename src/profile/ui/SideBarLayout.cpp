@@ -102,8 +102,8 @@ void CSideBarWnd::RecalcLayout() {
     int y = m_metrics.TopMargin;
 
     auto buttonSize = [](ImButton* button, wxSize fallback) {
-        const wxSize cell = button->CellSize();
-        return cell.x > 0 && cell.y > 0 ? cell : fallback;
+        const wxSize fit = button->FitSize();
+        return fit.x > 0 && fit.y > 0 ? fit : fallback;
     };
     const wxSize simpleSize = buttonSize(m_simpleButton, wxSize(56, 20));
     const wxSize advancedSize = buttonSize(m_advancedButton, wxSize(64, 20));

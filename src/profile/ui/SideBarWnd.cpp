@@ -93,6 +93,8 @@ void CSideBarWnd::CreateControls() {
     m_profileSelector = new wxChoice(this, kProfileSelector);
     m_discType = new wxChoice(this, kDiscType);
     m_saveButton = new ImButton(this, kSaveProfile, "SaveProfile");
+    // The skin draws this one as a menu glyph; its words would not fit beside the selector.
+    m_saveButton->SetTextShown(false);
     m_grid = new ParameterGrid(this, kGrid);
 
     m_bitRateLabel = new ImLabel(this, kBitRateLabel, "Bit Rate:");
