@@ -3,6 +3,7 @@
 #include "resources/Language.h"
 
 #include <wx/dcbuffer.h>
+#include <wx/dcclient.h>
 #include <wx/settings.h>
 #include <wx/toplevel.h>
 
@@ -423,9 +424,17 @@ void ImMenuBar::Measure() {
     m_itemCount = m_menu ? static_cast<int>(std::min<std::size_t>(m_menu->tops.size(), 20)) : 0;
     m_itemRects.clear();
     m_hotKeys.clear();
+    // Entries keep the skin's slot width; a caption longer than its slot (a translation) widens
+    // that slot alone, so captions neither overlap nor drift apart.
+    wxClientDC dc(this);
+    dc.SetFont(m_menuFont.IsOk() ? m_menuFont : GetFont());
+    int x = m_itemLeft;
     for (int k = 0; k < m_itemCount; ++k) {
-        m_itemRects.push_back(
-            MenuEntryRect(k, m_itemLeft, m_itemWidth, m_itemHeight, m_itemSpacing, m_marginTop));
+        SkinRect rect =
+            MenuEntryRect(0, x, m_itemWidth, m_itemHeight, m_itemSpacing, m_marginTop);
+        rect.w = std::max(m_itemWidth, dc.GetTextExtent(Stripped(EntryText(k))).x + 12);
+        m_itemRects.push_back(rect);
+        x += rect.w + m_itemSpacing;
         m_hotKeys.push_back(Mnemonic(EntryText(k)));
     }
     if (!m_picture.IsOk() && m_itemCount > 0) {

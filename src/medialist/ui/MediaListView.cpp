@@ -372,13 +372,36 @@ void CMediaListWnd::RecalcLayout() {
 
     const int rowLeft = m_endSpacing + left.x;
     const int rowRight = client.x - m_endSpacing - right.x;
+    // The gaps are 25 pixels (10 between Pause and Stop) while the row fits; a narrow window or
+    // long words close them up evenly.
+    int buttonsWidth = 0;
+    for (const wxSize& size : sizes) {
+        buttonsWidth += size.x;
+    }
+    int gap = 25;
+    int lastGap = 10;
+    if (const int room = rowRight - rowLeft - buttonsWidth - 8; room < 4 * gap + lastGap) {
+        gap = std::max(2, room / 5);
+        lastGap = std::min(lastGap, gap);
+    }
     std::array<int, 6> x{};
     x[kEncode] = (rowLeft + rowRight) / 2 + 30 - sizes[kEncode].x / 2;
     for (int i = kEncode - 1; i >= 0; --i) {
-        x[std::size_t(i)] = x[std::size_t(i) + 1] - 25 - sizes[std::size_t(i)].x;
+        x[std::size_t(i)] = x[std::size_t(i) + 1] - gap - sizes[std::size_t(i)].x;
     }
-    x[4] = x[3] + sizes[3].x + 25;
-    x[5] = x[4] + sizes[4].x + 10;
+    x[4] = x[3] + sizes[3].x + gap;
+    x[5] = x[4] + sizes[4].x + lastGap;
+    // Words beside the glyphs make the row wider than the skin's pictures alone; a translation
+    // can push it past an end picture, so the row moves back inside, Encode off centre.
+    int shift = 0;
+    if (x[0] < rowLeft) {
+        shift = rowLeft - x[0];
+    } else if (x[5] + sizes[5].x > rowRight) {
+        shift = std::max(rowLeft - x[0], rowRight - (x[5] + sizes[5].x));
+    }
+    for (int& left : x) {
+        left += shift;
+    }
     for (std::size_t i = 0; i < kButtons.size(); ++i) {
         m_buttons[i]->SetSize(x[i], rowTop + (rowHeight - sizes[i].y) / 2, sizes[i].x,
                               sizes[i].y);

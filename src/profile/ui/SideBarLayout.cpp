@@ -21,7 +21,7 @@ using namespace sidebar;
 namespace {
 
 constexpr int kLabelHeight = 18;
-constexpr int kSliderHeight = 28;
+constexpr int kSliderHeight = 24;
 constexpr int kEditHeight = 26;
 
 }  // namespace
@@ -82,6 +82,8 @@ bool CSideBarWnd::OnSkinChanged(const std::string& skinDir) {
     for (ImButton* button : {m_advancedButton, m_simpleButton, m_saveButton}) {
         // Bitmap buttons: the picture says it, the text is only the fall-back.
         button->SetTextShown(button->CellHeight() == 0);
+        // The words stay reachable under the mouse, in the current language.
+        button->SetToolTip(button->GetLabel());
         button->SetTextColours(Look().buttonText);
         button->SetFont(font);
     }
@@ -135,16 +137,18 @@ void CSideBarWnd::LayoutSimpleGroup(int x, int y, int width) {
     const std::pair<ImLabel*, ImTickSlider*> rows[] = {{m_bitRateLabel, m_bitRateSlider},
                                                        {m_sampleRateLabel, m_sampleRateSlider},
                                                        {m_volumeLabel, m_volumeSlider}};
+    // The column under the player is short: the rows keep a third of the skin's spacing.
+    const int gap = m_metrics.VSpacing / 3;
     for (const auto& [label, slider] : rows) {
         label->SetSize(x, y, width, kLabelHeight);
         y += kLabelHeight;
         slider->SetSize(x, y, width, kSliderHeight);
-        y += kSliderHeight + m_metrics.VSpacing;
+        y += kSliderHeight + gap;
     }
     m_channelsLabel->SetSize(x, y, width, kLabelHeight);
     y += kLabelHeight;
     m_channels->SetSize(x, y, width, std::max(kEditHeight, m_channels->GetBestSize().y));
-    y += m_channels->GetSize().y + 2 * m_metrics.VSpacing;
+    y += m_channels->GetSize().y + 2 * gap;
     m_volumeNameLabel->SetSize(x, y, width, kLabelHeight);
     y += kLabelHeight;
     m_volumeName->SetSize(x, y, width, kEditHeight);
