@@ -313,9 +313,16 @@ bool CMediaListWnd::OnSkinChanged(const std::string& skinDir) {
     m_list->SetFontOfCells(font);
     m_list->SetRowHeight(m_skin.GetInt("GridHeight", 17, section));
     m_cellText = NativeColour(m_skin.GetRgbColour("TextColor", 0, section));
-    m_list->SetColours(m_cellText, wxSystemSettings::GetColour(wxSYS_COLOUR_WINDOW),
-                       wxSystemSettings::GetColour(wxSYS_COLOUR_GRAYTEXT),
-                       wxSystemSettings::GetColour(wxSYS_COLOUR_HIGHLIGHT));
+    // The rows stand on the panel's own colour, so a dark skin gets a dark list.
+    const int disabled = m_skin.GetInt("TextColorDisabled", -1, section);
+    const int accent = m_skin.GetInt("TextColorDown", -1, section);
+    m_list->SetColours(m_cellText, Look().childBg,
+                       disabled == -1 ? wxSystemSettings::GetColour(wxSYS_COLOUR_GRAYTEXT)
+                                      : NativeColour(m_skin.GetRgbColour("TextColorDisabled", 0,
+                                                                         section)),
+                       accent == -1 ? wxSystemSettings::GetColour(wxSYS_COLOUR_HIGHLIGHT)
+                                    : NativeColour(m_skin.GetRgbColour("TextColorDown", 0,
+                                                                       section)));
     const int headerColour = m_skin.GetInt("HeaderBgColor", -1, section);
     if (auto* header = dynamic_cast<ImHeaderCtrl*>(HeaderOf(*m_list)); header && headerColour != -1) {
         header->SetColors(wxSystemSettings::GetColour(wxSYS_COLOUR_3DHIGHLIGHT),
