@@ -5,6 +5,7 @@
 #include "panels/ProgramDialogs.h"
 #include "panels/StatusWnd.h"
 #include "platform/Paths.h"
+#include "profile/ui/ParameterGrid.h"
 #include "profile/ui/SideBarWnd.h"
 #include "resources/Language.h"
 #include "shell/AppConfig.h"
@@ -99,6 +100,10 @@ CAudioEncDlg::CAudioEncDlg()
         if (m_firstPaintMs == 0) {
             m_firstPaintMs = wxGetUTCTimeMillis().GetValue();
         }
+        event.Skip();
+    });
+    Bind(wxEVT_IDLE, [this](wxIdleEvent& event) {
+        UpdateGridEditable();
         event.Skip();
     });
     Bind(wxEVT_ICONIZE, [this](wxIconizeEvent& event) {
@@ -639,6 +644,18 @@ void CAudioEncDlg::RunScriptCommand(const std::string& line) {
         int row = -1;
         in >> row;
         g_MediaList->SelectOnly(row);
+    } else if (verb == "grid" && g_SideBar != nullptr) {
+        // An edit in the advanced grid, committed as the grid's own editor commits it.
+        std::string key;
+        std::string value;
+        in >> key;
+        std::getline(in >> std::ws, value);
+        ParameterGrid* grid = g_SideBar->Grid();
+        const PropertyIterator item = grid->FindById(FindParameterIndex(key));
+        if (item.IsValid()) {
+            grid->Select(item);
+            grid->CommitEditText(value);
+        }
     } else if (verb == "profile" && g_SideBar != nullptr) {
         int index = 0;
         in >> index;

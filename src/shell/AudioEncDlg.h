@@ -86,6 +86,7 @@ private:
     void DispatchCommand(int id);
     void ApplyEnableRules(wxMenu& menu);
     void HandOverSelectedSets();
+    void UpdateGridEditable();
     static bool IsBitRateFree(const std::string& extension);
     void OnClose(wxCloseEvent& event);
     void OnTimer(wxTimerEvent& event);
@@ -100,6 +101,7 @@ private:
     wxTimer m_selectionTimer;
     std::unique_ptr<wxTaskBarIcon> m_tray;
     std::unique_ptr<CConvertMode> m_convert;
+    bool m_gridEditable = true;
     bool m_bInTray = false;
     bool m_bCloseAccepted = true;
     std::map<int, std::string> m_skinCommands;

@@ -96,6 +96,35 @@ void CAudioEncDlg::HandOverSelectedSets() {
     }
 }
 
+void CAudioEncDlg::UpdateGridEditable() {
+    if (g_SideBar == nullptr || g_MediaList == nullptr) {
+        return;
+    }
+    // Convert mode: something selected and none of it running, paused or pending.
+    bool editable = false;
+    if (GetWorkMode() == 0) {
+        const std::vector<MediaItem*> items = g_MediaList->Items();
+        for (int row = 0; row < static_cast<int>(items.size()); ++row) {
+            if (!g_MediaList->IsSelected(row)) {
+                continue;
+            }
+            const JobStatus status = items[std::size_t(row)]->Status();
+            if (status == JobStatus::Running || status == JobStatus::Paused ||
+                status == JobStatus::Pending) {
+                editable = false;
+                break;
+            }
+            editable = true;
+        }
+    } else {
+        editable = true;  // the rip and burn lists bring their own rules with their panels
+    }
+    if (editable != m_gridEditable) {
+        m_gridEditable = editable;
+        g_SideBar->SetGridEditable(editable);
+    }
+}
+
 void CAudioEncDlg::SetStatusText(const std::string& text) {
     if (g_StatusWnd != nullptr) {
         g_StatusWnd->SetStatusText(text);

@@ -238,4 +238,77 @@ TEST_F(ConvertWindowTest, TheStopButtonEndsTheRunWithTheCountdownWhichCanBeCance
     EXPECT_EQ(PowerLog(), "poweroff\n");
 }
 
+TEST_F(ConvertWindowTest, AGridEditReachesEverySelectedRowAndIsEncodedWithIt) {
+    Program program(m_home);
+    program.WaitShown();
+    program.Send("outdir " + (m_home / "out"));
+    for (int i = 0; i < 3; ++i) {
+        program.Send("add " + Wav("r" + std::to_string(i) + ".wav", 1.0, 20 + i));
+    }
+    program.WaitFor([](const State& s) { return Rows(s).size() == 3; });
+    program.Send("command 33055");  // Select All: the sets reach the grid after the 500 ms timer
+    std::this_thread::sleep_for(1s);
+    program.Send("grid ab 96");
+    const State state = program.WaitFor([](const State& s) {
+        return Field(s, "set0").find("ab:96;") != std::string::npos &&
+               Field(s, "set2").find("ab:96;") != std::string::npos;
+    });
+    for (const char* key : {"set0", "set1", "set2"}) {
+        EXPECT_NE(Field(state, key).find("ab:96;"), std::string::npos) << Field(state, key);
+    }
+    program.Send("command 32776");
+    program.WaitFor([](const State& s) { return AllRowsAre(s, kCompleted, 3); }, 60s);
+    const ac::test::ToolResult probe =
+        ac::test::RunTool(AC_BIN_DIR "/acprobe", {m_home / "out/r1.mp3"});
+    EXPECT_NE(probe.out.find("\"bitRate\":96000"), std::string::npos) << probe.out;
+}
+
+TEST_F(ConvertWindowTest, ACrashingToolFailsOnlyItsRow) {
+    // A tool that dies by a signal on one input and finishes the others.
+    const std::string tool = m_home / "crashing-ctt";
+    std::ofstream(tool) << "#!/bin/sh\ncase \"$*\" in *crash*) kill -SEGV $$ ;; esac\n"
+                           "echo \"|Time>>> 1\"\nexit 0\n";
+    ::chmod(tool.c_str(), 0755);
+    ::setenv("AC_CTT_PATH", tool.c_str(), 1);
+    const std::string bad = Wav("crash.wav", 1.0, 7);
+    const std::string good = Wav("fine.wav", 1.0, 8);
+    Program program(m_home);
+    program.WaitShown();
+    program.Send("outdir " + (m_home / "out"));
+    program.Send("add " + bad);
+    program.Send("add " + good);
+    program.WaitFor([](const State& s) { return Rows(s).size() == 2; });
+    program.Send("command 32776");
+    const State state = program.WaitFor(
+        [](const State& s) { return Status(s, 1) == kCompleted && Status(s, 0) != kRunning; });
+    EXPECT_EQ(Status(state, 0), -1) << "failed";
+    EXPECT_EQ(Status(state, 1), kCompleted);
+    EXPECT_TRUE(program.Running());
+}
+
+TEST_F(ConvertWindowTest, ClosingDuringARunAsksAndNoKeepsItRunning) {
+    UseSlowTool();
+    const std::string a = Wav("a.wav", 1.0, 9);
+    Program program(m_home);
+    program.WaitShown();
+    program.Send("outdir " + (m_home / "out"));
+    program.Send("add " + a);
+    program.WaitFor([](const State& s) { return Rows(s).size() == 1; });
+    program.Send("command 32776");
+    program.WaitFor([](const State& s) { return Status(s, 0) == kRunning; });
+
+    program.Send("answer no");
+    program.Send("command 32785");
+    State state = program.WaitFor([](const State& s) {
+        return Field(s, "boxes").find("Are you sure to stop encoding?") != std::string::npos;
+    });
+    std::this_thread::sleep_for(500ms);
+    ASSERT_TRUE(program.Running());
+    EXPECT_EQ(Status(program.ReadState(), 0), kRunning);
+
+    program.Send("answer yes");
+    program.Send("command 32785");
+    EXPECT_TRUE(program.WaitForExit());
+}
+
 }  // namespace
