@@ -2,6 +2,7 @@
 // files, folders and cue sheets, the check boxes, the commands' rules, profiles, and the list
 // as the driver's thread sees it. Runs under xvfb-run.
 
+#include "../support/WxTestApp.h"
 #include "medialist/ui/MediaListWnd.h"
 #include "medialist/ui/OutputPanelWnd.h"
 
@@ -95,16 +96,11 @@ protected:
         ::setenv("XDG_CONFIG_HOME", (home.Path() + "/config").c_str(), 1);
         ::unsetenv("XDG_MUSIC_DIR");
         s_home = home.Path();
-        static int argc = 1;
-        static char name[] = "medialist_window_tests";
-        static char* argv[] = {name, nullptr};
-        wxApp::SetInstance(new wxApp);
-        ASSERT_TRUE(wxEntryStart(argc, argv));
-        ASSERT_TRUE(wxTheApp->CallOnInit());
+        test::StartWx("medialist_window_tests");
         InstallWxUiQueue();
         wxInitAllImageHandlers();  // the skin's buttons are PNG pictures
     }
-    static void TearDownTestSuite() { wxEntryCleanup(); }
+    static void TearDownTestSuite() { test::StopWx(); }
 
     void SetUp() override {
         // Panels register with the skin manager for good; each case starts with no listeners.

@@ -3,6 +3,7 @@
 // a folder of their own, the real data.pkg of the build with its Default skin, event pumping
 // without timing, and screenshots for a person to look at (AC_SCREENSHOT_DIR).
 
+#include "../support/WxTestApp.h"
 #include "../support/TempDir.h"
 #include "resources/Language.h"
 #include "skin/SkinManager.h"
@@ -28,12 +29,7 @@ public:
     void SetUp() override {
         ::setenv("XDG_CONFIG_HOME", (m_home / "config").c_str(), 1);
         ::setenv("XDG_DATA_HOME", (m_home / "data").c_str(), 1);
-        static int argc = 1;
-        static char name[] = "panels_window_tests";
-        static char* argv[] = {name, nullptr};
-        wxApp::SetInstance(new wxApp);
-        ASSERT_TRUE(wxEntryStart(argc, argv));
-        ASSERT_TRUE(wxTheApp->CallOnInit());
+        StartWx("panels_window_tests");
         wxInitAllImageHandlers();
         InstallWxUiQueue();
         g_Language.Init(AC_BIN_DIR, "English");

@@ -1,6 +1,7 @@
 // XListCtrl's per-cell operations and its header check box, on a real window. Runs under
 // xvfb-run.
 
+#include "../support/WxTestApp.h"
 #include "skin/ListCtrl.h"
 
 #include <wx/app.h>
@@ -15,14 +16,9 @@ namespace {
 class ListCtrlTest : public ::testing::Test {
 protected:
     static void SetUpTestSuite() {
-        static int argc = 1;
-        static char name[] = "list_tests";
-        static char* argv[] = {name, nullptr};
-        wxApp::SetInstance(new wxApp);
-        ASSERT_TRUE(wxEntryStart(argc, argv));
-        ASSERT_TRUE(wxTheApp->CallOnInit());
+        test::StartWx("list_tests");
     }
-    static void TearDownTestSuite() { wxEntryCleanup(); }
+    static void TearDownTestSuite() { test::StopWx(); }
 
     void SetUp() override {
         m_frame = new wxFrame(nullptr, wxID_ANY, "list");

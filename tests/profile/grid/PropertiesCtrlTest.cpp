@@ -1,6 +1,7 @@
 // PropertiesCtrl on a real window: limits, rows, folding, editors and the order of the change
 // notification. Runs under xvfb-run.
 
+#include "../../support/WxTestApp.h"
 #include "profile/grid/PropertiesCtrl.h"
 
 #include "profile/grid/PropertyTree.h"
@@ -39,14 +40,9 @@ public:
 class PropertiesCtrlTest : public ::testing::Test {
 protected:
     static void SetUpTestSuite() {
-        static int argc = 1;
-        static char name[] = "grid_tests";
-        static char* argv[] = {name, nullptr};
-        wxApp::SetInstance(new wxApp);
-        ASSERT_TRUE(wxEntryStart(argc, argv));
-        ASSERT_TRUE(wxTheApp->CallOnInit());
+        test::StartWx("grid_tests");
     }
-    static void TearDownTestSuite() { wxEntryCleanup(); }
+    static void TearDownTestSuite() { test::StopWx(); }
 
     void SetUp() override {
         m_frame = new wxFrame(nullptr, wxID_ANY, "grid", wxDefaultPosition, wxSize(500, 400));

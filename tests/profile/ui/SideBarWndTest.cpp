@@ -1,6 +1,7 @@
 // The side bar on a real window with a fake main dialog: the catalogue loads from a data.pkg of
 // a test's own, user profiles saved, renamed and deleted survive a restart of the panel, and
 // edits in the grid and on the simple controls reach every set handed in. Runs under xvfb-run.
+#include "../../support/WxTestApp.h"
 #include "profile/ui/SideBarWnd.h"
 
 #include "profile/ui/ParameterGrid.h"
@@ -82,15 +83,10 @@ public:
 class SideBarTest : public test::ProfileFiles {
 protected:
     static void SetUpTestSuite() {
-        static int argc = 1;
-        static char name[] = "sidebar_tests";
-        static char* argv[] = {name, nullptr};
-        wxApp::SetInstance(new wxApp);
-        ASSERT_TRUE(wxEntryStart(argc, argv));
-        ASSERT_TRUE(wxTheApp->CallOnInit());
+        test::StartWx("sidebar_tests");
         InstallWxUiQueue();
     }
-    static void TearDownTestSuite() { wxEntryCleanup(); }
+    static void TearDownTestSuite() { test::StopWx(); }
 
     void SetUp() override {
         static test::TempDir* shared = new test::TempDir;
