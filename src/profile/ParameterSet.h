@@ -143,7 +143,9 @@ public:
     std::string GetSName() const override;
     std::string GetFormat() const override;
     std::string GetExtName() const override;
-    // A new Profile read afresh from the same path: unsaved changes are not carried over.
+    // A new Profile as the file read at the last load or save: unsaved changes are not carried
+    // over. The clone shares what was read (records, value lists) instead of reading the file
+    // again; every list row holds one, so this is what adding a file costs.
     std::unique_ptr<ParameterSet> Clone() const override;
     std::unique_ptr<Profile> CloneProfile() const;
 
@@ -153,17 +155,19 @@ public:
 
     // What the file said, unfilled by the table: the writer takes flags, defaults and lists
     // from here.
-    const std::vector<ParameterRecord>& FileRecords() const { return m_fileRecords; }
+    const std::vector<ParameterRecord>& FileRecords() const;
     bool IsLoaded() const { return m_loaded; }
 
-private:
+    // One value list of the file: its text and views into it (Profile.cpp).
     struct OwnedList;
-    ValueList KeepList(std::string_view listText);
+
+private:
+    // What one load read: shared, never changed, by the profile and all its clones.
+    struct Snapshot;
 
     std::string m_path;
     bool m_loaded = false;
-    std::vector<ParameterRecord> m_fileRecords;
-    std::vector<std::unique_ptr<OwnedList>> m_lists;
+    std::shared_ptr<const Snapshot> m_snapshot;
 };
 
 // Writes a profile file: Name, SName, Format, ExtName of Main, then one Parameter entry for

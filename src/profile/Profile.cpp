@@ -75,11 +75,27 @@ struct Profile::OwnedList {
     std::vector<std::string_view> items;
 };
 
+struct Profile::Snapshot {
+    std::vector<ParameterRecord> fileRecords;
+    std::vector<ParameterRecord> records;  // filled from the table, as a fresh load has them
+    std::vector<std::unique_ptr<OwnedList>> lists;
+};
+
+namespace {
+
+ValueList KeepList(std::vector<std::unique_ptr<Profile::OwnedList>>& lists,
+                   std::string_view listText);
+
+}  // namespace
+
 Profile::Profile() = default;
 Profile::~Profile() = default;
 Profile::Profile(std::string path) { Load(std::move(path)); }
 
-ValueList Profile::KeepList(std::string_view listText) {
+namespace {
+
+ValueList KeepList(std::vector<std::unique_ptr<Profile::OwnedList>>& lists,
+                   std::string_view listText) {
     if (!listText.empty() && listText.front() == '{') listText.remove_prefix(1);
     if (!listText.empty() && listText.back() == '}') listText.remove_suffix(1);
     FieldSplitter splitter(',', '"');
@@ -93,7 +109,7 @@ ValueList Profile::KeepList(std::string_view listText) {
         items.push_back(CleanField(splitter, i));
         total += items.back().size();
     }
-    auto list = std::make_unique<OwnedList>();
+    auto list = std::make_unique<Profile::OwnedList>();
     list->text = std::make_unique<char[]>(total + 1);
     list->items.reserve(count);
     char* cursor = list->text.get();
@@ -103,18 +119,21 @@ ValueList Profile::KeepList(std::string_view listText) {
         cursor += item.size();
     }
     const ValueList view(list->items);
-    m_lists.push_back(std::move(list));
+    lists.push_back(std::move(list));
     return view;
 }
+
+}  // namespace
 
 bool Profile::Load(std::string path) {
     m_path = std::move(path);
     m_loaded = false;
     m_records.clear();
-    m_fileRecords.clear();
-    m_lists.clear();
+    m_snapshot.reset();
     if (GetName().empty()) return false;
 
+    auto snapshot = std::make_shared<Snapshot>();
+    std::vector<ParameterRecord>& fileRecords = snapshot->fileRecords;
     const ParameterSection section(m_path);
     for (const ParameterDef& def : ParameterTable()) {
         const std::string key(def.key);
@@ -135,31 +154,38 @@ bool Profile::Load(std::string path) {
         if (count >= 1) record.flags = ParseFlagField(CleanField(splitter, 1));
         if (count >= 2) record.defaultValue = CleanField(splitter, 2);
         if (count >= 3) record.value = CleanField(splitter, 3);
-        if (!listText.empty()) record.values = KeepList(listText);
-        m_fileRecords.push_back(std::move(record));
+        if (!listText.empty()) record.values = KeepList(snapshot->lists, listText);
+        fileRecords.push_back(std::move(record));
 
         // The start offset and the output name are edited side by side in the grid, so a
         // profile with one always offers the other.
         if (def.key == "ss") {
             ParameterRecord outName;
             outName.name = "outfilename";
-            m_fileRecords.push_back(std::move(outName));
+            fileRecords.push_back(std::move(outName));
         }
     }
 
-    m_records.reserve(m_fileRecords.size());
-    for (const ParameterRecord& fileRecord : m_fileRecords) {
+    m_records.reserve(fileRecords.size());
+    for (const ParameterRecord& fileRecord : fileRecords) {
         ParameterRecord record = fileRecord;
         if (record.defaultValue.empty()) record.defaultValue = GetParameterDefault(record.name);
         if (!record.defaultValue.empty() && record.value.empty()) record.value = record.defaultValue;
         if (record.values.empty()) record.values = GetParameterValueList(record.name);
         m_records.push_back(std::move(record));
     }
+    snapshot->records = m_records;
+    m_snapshot = std::move(snapshot);
     m_loaded = true;
     return true;
 }
 
 bool Profile::Reload() { return Load(m_path); }
+
+const std::vector<ParameterRecord>& Profile::FileRecords() const {
+    static const std::vector<ParameterRecord> kNone;
+    return m_snapshot ? m_snapshot->fileRecords : kNone;
+}
 
 std::string Profile::GetName() const {
     const std::string tag = g_Language.GetLangCode();
@@ -185,7 +211,15 @@ bool Profile::IsSysProfile() const {
 }
 
 std::unique_ptr<Profile> Profile::CloneProfile() const {
-    return std::make_unique<Profile>(m_path);
+    if (!m_snapshot) {
+        return std::make_unique<Profile>(m_path);
+    }
+    auto clone = std::make_unique<Profile>();
+    clone->m_path = m_path;
+    clone->m_loaded = m_loaded;
+    clone->m_snapshot = m_snapshot;
+    clone->m_records = m_snapshot->records;
+    return clone;
 }
 
 std::unique_ptr<ParameterSet> Profile::Clone() const { return CloneProfile(); }
