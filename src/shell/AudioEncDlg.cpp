@@ -6,6 +6,7 @@
 #include "panels/StatusWnd.h"
 #include "platform/Paths.h"
 #include "profile/ui/ParameterGrid.h"
+#include "profile/ui/SaveProfileDlg.h"
 #include "profile/ui/SideBarWnd.h"
 #include "resources/Language.h"
 #include "shell/AppConfig.h"
@@ -26,6 +27,7 @@
 #include <wx/filename.h>
 #include <wx/graphics.h>
 #include <wx/msgdlg.h>
+#include <wx/textctrl.h>
 #include <wx/taskbar.h>
 #include <wx/time.h>
 #include <wx/utils.h>
@@ -158,6 +160,10 @@ void CAudioEncDlg::OnInitDialog() {
     InitialPlacement();
     g_MainDlg = this;
     InstallWxUiQueue();
+    if (BoxesAreScripted()) {
+        SetProfileMessageHook(
+            [this](const std::string& text, long style) { return AppMessageBox(text, style, this); });
+    }
     SetMainHub(this);
     wxIconBundle icons;
     for (int size : {16, 32, 48}) {
@@ -656,6 +662,27 @@ void CAudioEncDlg::RunScriptCommand(const std::string& line) {
             grid->Select(item);
             grid->CommitEditText(value);
         }
+    } else if (verb == "dialogtext") {
+        // Types into the first edit field of the modal dialog in front.
+        for (wxWindow* window : wxTopLevelWindows) {
+            auto* dialog = dynamic_cast<wxDialog*>(window);
+            if (dialog == nullptr || !dialog->IsModal()) {
+                continue;
+            }
+            for (wxWindow* child : dialog->GetChildren()) {
+                if (auto* edit = dynamic_cast<wxTextCtrl*>(child)) {
+                    edit->SetValue(wxString::FromUTF8(rest));
+                    break;
+                }
+            }
+            break;
+        }
+    } else if (verb == "saveas" && g_SideBar != nullptr) {
+        g_SideBar->SaveProfile(true);
+    } else if (verb == "rename" && g_SideBar != nullptr) {
+        g_SideBar->RenameProfile();
+    } else if (verb == "delete" && g_SideBar != nullptr) {
+        g_SideBar->DeleteProfile();
     } else if (verb == "profile" && g_SideBar != nullptr) {
         int index = 0;
         in >> index;

@@ -35,11 +35,18 @@ public:
             }
             in.close();
             std::remove(commands.c_str());
+            // Each command runs from the event loop, not from this timer: a command that opens
+            // a modal dialog must leave the timer free to deliver the next one to it.
             for (const std::string& command : lines) {
                 if (!m_dialog) {
                     return;
                 }
-                m_dialog->RunScriptCommand(command);
+                wxWeakRef<CAudioEncDlg> dialog = m_dialog;
+                m_dialog->CallAfter([dialog, command] {
+                    if (dialog) {
+                        dialog->RunScriptCommand(command);
+                    }
+                });
             }
         }
         if (!m_dialog) {

@@ -10,6 +10,7 @@
 
 #include <sys/stat.h>
 
+#include <algorithm>
 #include <cstdlib>
 #include <filesystem>
 #include <thread>
@@ -261,6 +262,65 @@ TEST_F(ConvertWindowTest, AGridEditReachesEverySelectedRowAndIsEncodedWithIt) {
     const ac::test::ToolResult probe =
         ac::test::RunTool(AC_BIN_DIR "/acprobe", {m_home / "out/r1.mp3"});
     EXPECT_NE(probe.out.find("\"bitRate\":96000"), std::string::npos) << probe.out;
+}
+
+bool HasProfile(const State& state, const std::string& name) {
+    return Field(state, "profiles_list").find("|" + name + "  (*.") != std::string::npos;
+}
+
+TEST_F(ConvertWindowTest, UserProfilesSavedRenamedAndDeletedStayThatWayAfterARestart) {
+    {
+        Program program(m_home);
+        program.WaitFor([](const State& s) { return Field(s, "profiles") > "0"; });
+        program.Send("saveas");
+        program.Send("dialogtext Night Drive");
+        program.Send("dialog ok");
+        const State saved =
+            program.WaitFor([](const State& s) { return HasProfile(s, "Night Drive"); });
+        ASSERT_TRUE(HasProfile(saved, "Night Drive")) << Field(saved, "profiles_list");
+        program.Send("close");
+        ASSERT_TRUE(program.WaitForExit());
+    }
+    {
+        Program program(m_home);
+        const State loaded =
+            program.WaitFor([](const State& s) { return HasProfile(s, "Night Drive"); });
+        ASSERT_TRUE(HasProfile(loaded, "Night Drive")) << "saved in user.pkg";
+        const std::string list = Field(loaded, "profiles_list");
+        const int index = static_cast<int>(std::count(list.begin(), list.begin() +
+                                                      static_cast<long>(list.find("|Night Drive")),
+                                                      '|'));
+        program.Send("profile " + std::to_string(index));
+        program.Send("rename");
+        program.Send("dialogtext Long Drive");
+        program.Send("dialog ok");
+        const State renamed =
+            program.WaitFor([](const State& s) { return HasProfile(s, "Long Drive"); });
+        ASSERT_TRUE(HasProfile(renamed, "Long Drive"));
+        program.Send("close");
+        ASSERT_TRUE(program.WaitForExit());
+    }
+    {
+        Program program(m_home);
+        const State loaded =
+            program.WaitFor([](const State& s) { return HasProfile(s, "Long Drive"); });
+        ASSERT_TRUE(HasProfile(loaded, "Long Drive"));
+        EXPECT_FALSE(HasProfile(loaded, "Night Drive"));
+        const std::string list = Field(loaded, "profiles_list");
+        const int index = static_cast<int>(std::count(list.begin(), list.begin() +
+                                                      static_cast<long>(list.find("|Long Drive")),
+                                                      '|'));
+        program.Send("profile " + std::to_string(index));
+        program.Send("answer yes");
+        program.Send("delete");
+        program.WaitFor([](const State& s) { return !HasProfile(s, "Long Drive"); });
+        program.Send("close");
+        ASSERT_TRUE(program.WaitForExit());
+    }
+    Program program(m_home);
+    program.WaitFor([](const State& s) { return Field(s, "profiles") > "0"; });
+    std::this_thread::sleep_for(500ms);
+    EXPECT_FALSE(HasProfile(program.ReadState(), "Long Drive"));
 }
 
 TEST_F(ConvertWindowTest, ACrashingToolFailsOnlyItsRow) {

@@ -365,6 +365,11 @@ std::string CSideBarWnd::DescribeState() const {
                 : std::string())
         << "\n";
     out << "profiles=" << m_catalogue.Count() << "\n";
+    out << "profiles_list=";
+    for (unsigned i = 0; i < m_profileSelector->GetCount(); ++i) {
+        out << "|" << m_profileSelector->GetString(i).utf8_string();
+    }
+    out << "\n";
     out << "grid=" << m_grid->Describe() << "\n";
     auto control = [&](const char* name, const ImLabel* label, const wxWindow* slider) {
         out << name << "=" << label->GetLabel().utf8_string() << "|"
