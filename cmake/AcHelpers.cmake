@@ -56,6 +56,10 @@ function(ac_add_test name)
   if(AC_TSAN)
     list(APPEND environment "TSAN_OPTIONS=suppressions=${CMAKE_SOURCE_DIR}/tests/tsan.supp")
   endif()
+  if(AC_ASAN)
+    list(APPEND environment
+         "LSAN_OPTIONS=suppressions=${CMAKE_SOURCE_DIR}/tests/lsan.supp:print_suppressions=0")
+  endif()
   set_tests_properties(${name} PROPERTIES TIMEOUT 600 ENVIRONMENT "${environment}")
 endfunction()
 
