@@ -118,12 +118,17 @@ void CConvertMode::Shutdown() {
         return;
     }
     m_driver->Stop();
-    // The rows outlive the driver by a moment while the windows go; a child ending then must
-    // not call into a driver that is gone.
+    // The rows outlive the driver by a moment while the windows go. A child's exit must not
+    // call into a driver that is gone, and one already calling must have finished: cut the
+    // callbacks, end what still runs, and join every child's threads before the driver goes.
     if (g_MediaList != nullptr) {
         for (MediaItem* item : g_MediaList->Items()) {
             if (CEncodeProcess* process = item->process.load()) {
                 process->ClearCallback();
+                if (process->IsRunning()) {
+                    process->Kill(65535);
+                }
+                process->WaitForExit();
             }
         }
     }
