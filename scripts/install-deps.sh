@@ -9,7 +9,7 @@ packages=(
   # toolkit and libraries
   libwxgtk3.2-dev libzip-dev zlib1g-dev
   libavformat-dev libavcodec-dev libswresample-dev libavutil-dev
-  libcdio-dev libcdio-paranoia-dev libburn-dev libisofs-dev libsdl2-dev
+  libcdio-dev libcdio-paranoia-dev libburn-dev libisofs-dev libsdl2-dev libuchardet-dev
   # tests and benchmarks
   googletest libgtest-dev libbenchmark-dev xvfb xauth x11-utils imagemagick ffmpeg hyperfine time
 )
