@@ -2,6 +2,7 @@
 // ctt has always needed.
 #include "convert/CommandLine.h"
 
+#include "platform/CommandLine.h"
 #include "profile/ParameterSet.h"
 #include "profile/TextUtil.h"
 
@@ -35,9 +36,9 @@ enum class JobKind { Conversion, Burn };
 std::string BuildJobText(std::string_view source, std::string_view output, std::int32_t volume,
                          ParameterSet& parameters, JobKind kind) {
     std::string text = " -relk -y ";
-    text += " -i \"";
-    text += source;
-    text += "\" ";
+    text += " -i ";
+    text += platform::QuoteCommandValue(source);
+    text += ' ';
     text += parameters.BuildCommandLine();
     // ctt picks the FLAC encoder through the container, not through a codec option.
     if (kind == JobKind::Conversion && EndsWithNoCase(output, "flac")) ReplaceAll(text, "-acodec", "-f");
@@ -49,7 +50,7 @@ std::string BuildJobText(std::string_view source, std::string_view output, std::
     if (kind == JobKind::Burn) {
         text += " -vn ";
     } else {
-        if (EqualsNoCase(extension, "aac")) text += " -ac \"" + parameters.GetValue("ac") + "\"";
+        if (EqualsNoCase(extension, "aac")) text += " -ac " + platform::QuoteCommandValue(parameters.GetValue("ac"));
         if (EqualsNoCase(extension, "wma") || EqualsNoCase(extension, "m4a") ||
             EqualsNoCase(extension, "mp4")) {
             text += " -vn ";
@@ -58,9 +59,8 @@ std::string BuildJobText(std::string_view source, std::string_view output, std::
             parameters.SetValue("title", SourceTitle(source));
         }
     }
-    text += " \"";
-    text += output;
-    text += '"';
+    text += ' ';
+    text += platform::QuoteCommandValue(output);
     return text;
 }
 

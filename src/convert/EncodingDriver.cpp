@@ -1,5 +1,6 @@
 #include "convert/EncodingDriver.h"
 
+#include "platform/PartFiles.h"
 #include "resources/Language.h"
 #include "resources/TextFormat.h"
 
@@ -137,8 +138,10 @@ bool EncodingDriver::RunPass() {
 
     // The driver selected the rows it started, so the selection test covers the last of them.
     if (m_processCount == 0 && m_runPending == 1 && !AnySelectedActive() &&
-        m_finishPosted.exchange(1) == 0)
+        m_finishPosted.exchange(1) == 0) {
+        m_sweptDirectories.clear();
         m_host.PostRunFinished();
+    }
     return true;
 }
 
@@ -170,19 +173,26 @@ void EncodingDriver::StartRow(int row, MediaItem& item, bool& proceed, std::stri
     }
     item.SetStatus(JobStatus::Running);
     m_list.SelectOnly(row);
-    item.outputPath = m_namer(row, item, directory, lastOutput);
+    item.outputHold = m_namer(row, item, directory, lastOutput);
+    item.outputPath = item.outputHold.Path();
     lastOutput = item.outputPath;
     if (m_beforeLaunch)
         m_beforeLaunch(row);
     // Stopped by the user while it was being named: no child, and the old output stays.
-    if (item.Status() == JobStatus::Aborted)
+    if (item.Status() == JobStatus::Aborted) {
+        item.outputHold.Release();
         return;
+    }
 
     std::string commandText = m_builder(item);
     std::error_code ignored;
     fs::remove(item.outputPath, ignored);
+    if (m_sweptDirectories.insert(directory).second)
+        platform::SweepStalePartFiles(directory);
     child->SetCurrentDirectory(m_config.toolDirectory);
+    child->SetOutputPath(item.outputPath);
     if (!child->Launch("\"" + m_config.toolPath + "\" " + commandText)) {
+        item.outputHold.Release();
         item.SetStatus(JobStatus::Failed);
         m_list.RefreshRow(row);
         return;
@@ -224,6 +234,7 @@ void EncodingDriver::OnProcessExit(CEncodeProcess* process) {
         std::error_code ignored;
         fs::remove(item->outputPath, ignored);
     }
+    item->outputHold.Release();
     --m_processCount;
     JobStatus old = item->status.exchange(final);
     if (old != JobStatus::Paused && old != JobStatus::Pending && old != JobStatus::AbortedSuspended)
@@ -352,6 +363,7 @@ void EncodingDriver::PauseSelected() {
 }
 
 void EncodingDriver::StopRows(RowSet set) {
+    std::vector<CEncodeProcess*> asked;
     for (int row = 0; row < m_list.GetRowCount(); ++row) {
         MediaItem* item = m_list.GetItem(row);
         if (!item || !InSet(set, row))
@@ -365,10 +377,15 @@ void EncodingDriver::StopRows(RowSet set) {
             Move(*item, status, JobStatus::Idle);
         // The counters follow when the exit arrives, through OnProcessExit.
         CEncodeProcess* child = item->process.load();
-        if (child && child->IsRunning())
-            child->Kill(kStoppedExitCode);
+        if (child && child->IsRunning()) {
+            child->RequestStop(kStoppedExitCode);
+            asked.push_back(child);
+        }
         m_list.RefreshRow(row);
     }
+    // All were asked at once, so a run of tools that ignore the request costs one grace period.
+    for (CEncodeProcess* child : asked)
+        child->Kill(kStoppedExitCode);
     Wake();
 }
 

@@ -18,6 +18,7 @@
 #include <cstdint>
 #include <functional>
 #include <mutex>
+#include <set>
 #include <string>
 #include <thread>
 
@@ -68,9 +69,9 @@ struct DriverConfig {
     int passPeriodMs = 500;
 };
 
-// Names the output of a row from the directory and the name chosen last in this pass, so two
-// rows of one pass never pick the same free name.
-using OutputNamer = std::function<std::string(
+// Names the output of a row from the directory and the name chosen last in this pass, and
+// holds the name (ReserveOutputPath) until the row's job has ended.
+using OutputNamer = std::function<OutputHold(
     int row, MediaItem& item, const std::string& directory, const std::string& lastOutput)>;
 // The text after the tool's name, for a row whose outputPath is set. May change the row's
 // parameters (a profile keeps what its last command line made of it).
@@ -169,6 +170,10 @@ private:
     std::atomic<int> m_afterConvertAction{4};
     // One 0x466 per run end, however many passes see the end before the UI thread handles it.
     std::atomic<int> m_finishPosted{0};
+
+    // Folders written in this run, swept once for part files of tools that died with an
+    // earlier program. Driver thread only.
+    std::set<std::string> m_sweptDirectories;
 
     std::mutex m_wakeMutex;
     std::condition_variable m_wakeCondition;

@@ -8,6 +8,7 @@
 // the row; others read it after they have seen a status that the start or the exit wrote.
 
 #include "convert/EncodeProcess.h"
+#include "convert/OutputNaming.h"
 #include "medialist/MediaFileInfo.h"
 
 #include <atomic>
@@ -50,6 +51,8 @@ struct MediaItem {
     std::atomic<std::int32_t> inRun{0};
     std::string sourcePath;  // a file, or a cue track "SHEET|N"
     std::string outputPath;
+    // Held from naming until the job has ended, so no other job takes the name meanwhile.
+    OutputHold outputHold;
     MediaFileInfo info;
     std::atomic<std::int32_t> volume{50};
     // Created by the driver at the first start and kept: its time and error lines outlive a run.

@@ -9,6 +9,8 @@
 #include <sys/stat.h>
 
 #include <cstdio>
+#include <mutex>
+#include <vector>
 
 namespace ac {
 namespace {
@@ -84,6 +86,20 @@ std::string JoinPath(std::string_view directory, const std::string& base, std::s
     return std::string(directory) + "/" + name;
 }
 
+// The names held by running jobs. Few at a time (one per running job), so a vector will do.
+std::mutex s_heldMutex;
+std::vector<std::string> s_held;
+
+bool HeldLocked(std::string_view path) {
+    for (const std::string& held : s_held)
+        if (EqualsNoCase(held, path)) return true;
+    return false;
+}
+
+// MakeOutputPath's body; the caller holds s_heldMutex.
+std::string MakeOutputPathLocked(ParameterSet& parameters, const OutputNameRequest& request,
+                                 const NamingSettings& settings, const FileExistsFn& exists);
+
 }  // namespace
 
 NamingSettings ReadNamingSettings(AppConfig& config) {
@@ -127,6 +143,57 @@ bool PathExistsOnDisk(const std::string& path) {
 
 std::string MakeOutputPath(ParameterSet& parameters, const OutputNameRequest& request,
                            const NamingSettings& settings, const FileExistsFn& exists) {
+    std::lock_guard lock(s_heldMutex);
+    return MakeOutputPathLocked(parameters, request, settings, exists);
+}
+
+OutputHold& OutputHold::operator=(OutputHold&& other) noexcept {
+    if (this != &other) {
+        Release();
+        m_path = std::move(other.m_path);
+        other.m_path.clear();
+    }
+    return *this;
+}
+
+void OutputHold::Release() {
+    if (m_path.empty()) return;
+    std::lock_guard lock(s_heldMutex);
+    for (auto it = s_held.begin(); it != s_held.end(); ++it) {
+        if (*it == m_path) {
+            s_held.erase(it);
+            break;
+        }
+    }
+    m_path.clear();
+}
+
+bool IsOutputHeld(std::string_view path) {
+    std::lock_guard lock(s_heldMutex);
+    return HeldLocked(path);
+}
+
+OutputHold HoldOutputPath(std::string path) {
+    std::lock_guard lock(s_heldMutex);
+    OutputHold hold;
+    hold.m_path = std::move(path);
+    s_held.push_back(hold.m_path);
+    return hold;
+}
+
+OutputHold ReserveOutputPath(ParameterSet& parameters, const OutputNameRequest& request,
+                             const NamingSettings& settings, const FileExistsFn& exists) {
+    std::lock_guard lock(s_heldMutex);
+    OutputHold hold;
+    hold.m_path = MakeOutputPathLocked(parameters, request, settings, exists);
+    s_held.push_back(hold.m_path);
+    return hold;
+}
+
+namespace {
+
+std::string MakeOutputPathLocked(ParameterSet& parameters, const OutputNameRequest& request,
+                                 const NamingSettings& settings, const FileExistsFn& exists) {
     const std::string filtered = FilterFileName(parameters.GetOutputFileName(), settings);
     std::string base = BaseName(filtered.empty() ? request.sourcePath : std::string_view(filtered));
 
@@ -149,12 +216,18 @@ std::string MakeOutputPath(ParameterSet& parameters, const OutputNameRequest& re
     while (!directory.empty() && directory.back() == '/') directory.remove_suffix(1);
 
     std::string path = JoinPath(directory, base, extension);
-    if (settings.outputFileOverwrite != 0 || request.skipSearch) return path;
+    const bool searchDisk = settings.outputFileOverwrite == 0 && !request.skipSearch;
+    auto taken = [&](const std::string& candidate) {
+        if (HeldLocked(candidate)) return true;
+        return searchDisk && (exists(candidate) || EqualsNoCase(candidate, request.lastOutput));
+    };
     // Bounded, so a check that always answers "exists" cannot hang the driver.
-    for (int n = 1; n < 1'000'000 && (exists(path) || EqualsNoCase(path, request.lastOutput)); ++n) {
+    for (int n = 1; n < 1'000'000 && taken(path); ++n) {
         path = JoinPath(directory, base + "-" + std::to_string(n), extension);
     }
     return path;
 }
+
+}  // namespace
 
 }  // namespace ac

@@ -46,9 +46,49 @@ struct OutputNameRequest {
 };
 
 // The full output path of a row. Name and tags come from `parameters` (its output file name and
-// its author, year, composer, genre and album values).
+// its author, year, composer, genre and album values). A name held by a job of this process
+// (OutputHold) is never chosen, whatever the overwrite setting: overwriting replaces a file of
+// an earlier run, never a sibling's output that is still being written.
 std::string MakeOutputPath(ParameterSet& parameters, const OutputNameRequest& request,
                            const NamingSettings& settings,
                            const FileExistsFn& exists = PathExistsOnDisk);
+
+// An output path that a job of this process is writing or is about to write. Every driver
+// (conversion, rip, burn) holds its job's name from naming until the job has ended, so that
+// two jobs never pick one name, even while neither file exists yet: the tool writes a hidden
+// part file and gives it the name only when it is complete. Move-only; released on
+// destruction.
+class OutputHold {
+public:
+    OutputHold() = default;
+    ~OutputHold() { Release(); }
+    OutputHold(OutputHold&& other) noexcept : m_path(std::move(other.m_path)) { other.m_path.clear(); }
+    OutputHold& operator=(OutputHold&& other) noexcept;
+    OutputHold(const OutputHold&) = delete;
+    OutputHold& operator=(const OutputHold&) = delete;
+
+    const std::string& Path() const { return m_path; }
+    bool Empty() const { return m_path.empty(); }
+    void Release();
+
+private:
+    friend OutputHold ReserveOutputPath(ParameterSet&, const OutputNameRequest&,
+                                        const NamingSettings&, const FileExistsFn&);
+    friend OutputHold HoldOutputPath(std::string path);
+    std::string m_path;
+};
+
+// Whether a job of this process holds the path (without regard to case, as the search for a
+// free name compares).
+bool IsOutputHeld(std::string_view path);
+
+// Holds a path named some other way (a fixed name of a test, a temporary file).
+OutputHold HoldOutputPath(std::string path);
+
+// MakeOutputPath and the hold of its result in one step, so drivers on several threads cannot
+// both take one free name.
+OutputHold ReserveOutputPath(ParameterSet& parameters, const OutputNameRequest& request,
+                             const NamingSettings& settings,
+                             const FileExistsFn& exists = PathExistsOnDisk);
 
 }  // namespace ac

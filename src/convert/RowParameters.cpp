@@ -31,3 +31,23 @@ ParameterSet* SetOf(MediaItem& item) {
 }
 
 }  // namespace ac
+
+namespace ac {
+
+OutputNamer MakeRowNamer(std::function<NamingSettings()> settings) {
+    return [settings = std::move(settings)](int row, MediaItem& item, const std::string& directory,
+                                            const std::string& lastOutput) {
+        ParameterSet* set = SetOf(item);
+        if (set == nullptr) {
+            return OutputHold();
+        }
+        OutputNameRequest request;
+        request.sourcePath = item.sourcePath;
+        request.row = row;
+        request.lastOutput = lastOutput;
+        request.directory = directory;
+        return ReserveOutputPath(*set, request, settings());
+    };
+}
+
+}  // namespace ac

@@ -7,11 +7,14 @@
 // Thread contract: Set() and Refresh() under the list lock (or before any thread shares the
 // row); GetDuration/GetStartTime from any thread.
 
+#include "convert/EncodingDriver.h"
 #include "convert/MediaItem.h"
+#include "convert/OutputNaming.h"
 #include "profile/ParameterSet.h"
 
 #include <atomic>
 #include <cstdint>
+#include <functional>
 #include <memory>
 
 namespace ac {
@@ -40,5 +43,9 @@ private:
 // a row without parameters.
 ParameterSet* SetOf(MediaItem& item);
 RowParameters* RowParametersOf(MediaItem& item);
+
+// The conversion list's namer: the row's set and source, and the naming settings as they are
+// when the row starts (the preferences may change them between rows).
+OutputNamer MakeRowNamer(std::function<NamingSettings()> settings);
 
 }  // namespace ac

@@ -1,6 +1,7 @@
 #include "medialist/CueSheet.h"
 
-#include <iconv.h>
+#include "medialist/TextDecoding.h"
+
 
 #include <algorithm>
 #include <cctype>
@@ -13,100 +14,6 @@
 
 namespace ac {
 namespace {
-
-bool IsValidUtf8(std::string_view s) {
-    size_t i = 0;
-    while (i < s.size()) {
-        auto c = static_cast<unsigned char>(s[i]);
-        size_t extra = 0;
-        if (c < 0x80) {
-            ++i;
-            continue;
-        } else if (c >= 0xC2 && c <= 0xDF) {
-            extra = 1;
-        } else if (c >= 0xE0 && c <= 0xEF) {
-            extra = 2;
-        } else if (c >= 0xF0 && c <= 0xF4) {
-            extra = 3;
-        } else {
-            return false;
-        }
-        if (i + extra >= s.size()) {
-            return false;
-        }
-        for (size_t k = 1; k <= extra; ++k) {
-            if ((static_cast<unsigned char>(s[i + k]) & 0xC0) != 0x80) {
-                return false;
-            }
-        }
-        i += extra + 1;
-    }
-    return true;
-}
-
-std::string Iconv(std::string_view bytes, const char* from) {
-    iconv_t cd = iconv_open("UTF-8", from);
-    if (cd == reinterpret_cast<iconv_t>(-1)) {
-        return std::string(bytes);
-    }
-    std::string out;
-    std::string in(bytes);
-    char* inPtr = in.data();
-    size_t inLeft = in.size();
-    char buffer[4096];
-    while (inLeft > 0) {
-        char* outPtr = buffer;
-        size_t outLeft = sizeof buffer;
-        size_t r = iconv(cd, &inPtr, &inLeft, &outPtr, &outLeft);
-        out.append(buffer, static_cast<size_t>(outPtr - buffer));
-        if (r == static_cast<size_t>(-1) && errno != E2BIG) {
-            // An unmappable or cut-off byte: keep going without it.
-            ++inPtr;
-            --inLeft;
-        }
-    }
-    iconv_close(cd);
-    return out;
-}
-
-// Shift-JIS text is pairs of a lead byte and a trail byte, and most Japanese letters have
-// leads 0x81..0x9F, which Cyrillic or Western text in a Windows code page hardly uses.
-bool LooksShiftJis(std::string_view s) {
-    size_t leads = 0;
-    size_t lowLeads = 0;
-    for (size_t i = 0; i < s.size(); ++i) {
-        const auto c = static_cast<unsigned char>(s[i]);
-        if (c < 0x80 || (c >= 0xA1 && c <= 0xDF)) {
-            continue;
-        }
-        if (!((c >= 0x81 && c <= 0x9F) || (c >= 0xE0 && c <= 0xFC)) || i + 1 >= s.size()) {
-            return false;
-        }
-        const auto t = static_cast<unsigned char>(s[++i]);
-        if (t < 0x40 || t == 0x7F || t > 0xFC) {
-            return false;
-        }
-        ++leads;
-        lowLeads += c <= 0x9F;
-    }
-    return leads > 0 && lowLeads * 2 > leads;
-}
-
-// Cyrillic words in 1251 are runs of high bytes; Western text has an odd accented letter
-// among ASCII ones.
-bool LooksCyrillic1251(std::string_view s) {
-    size_t inRuns = 0;
-    size_t alone = 0;
-    for (size_t i = 0; i < s.size(); ++i) {
-        if (static_cast<unsigned char>(s[i]) < 0x80) {
-            continue;
-        }
-        const bool before = i > 0 && static_cast<unsigned char>(s[i - 1]) >= 0x80;
-        const bool after = i + 1 < s.size() && static_cast<unsigned char>(s[i + 1]) >= 0x80;
-        (before || after ? inRuns : alone) += 1;
-    }
-    return inRuns > alone;
-}
 
 std::string Upper(std::string_view s) {
     std::string out(s);
@@ -223,18 +130,12 @@ std::string DecodeCueText(std::string_view bytes) {
         return std::string(bytes.substr(3));
     }
     if (bytes.size() >= 2 && bytes.substr(0, 2) == "\xFF\xFE") {
-        return Iconv(bytes.substr(2), "UTF-16LE");
+        return ConvertToUtf8(bytes.substr(2), "UTF-16LE");
     }
     if (bytes.size() >= 2 && bytes.substr(0, 2) == "\xFE\xFF") {
-        return Iconv(bytes.substr(2), "UTF-16BE");
+        return ConvertToUtf8(bytes.substr(2), "UTF-16BE");
     }
-    if (IsValidUtf8(bytes)) {
-        return std::string(bytes);
-    }
-    if (LooksShiftJis(bytes)) {
-        return Iconv(bytes, "SHIFT_JIS");
-    }
-    return Iconv(bytes, LooksCyrillic1251(bytes) ? "WINDOWS-1251" : "WINDOWS-1252");
+    return DecodeUnlabelledText(bytes);
 }
 
 CueSheetData ParseCueSheet(std::string_view bytes) {

@@ -1,5 +1,7 @@
 #include "medialist/MediaProbe.h"
 
+#include "medialist/TextDecoding.h"
+
 #include <algorithm>
 #include <climits>
 #include <cstdio>
@@ -29,7 +31,8 @@ std::string Tag(const AVFormatContext* ic, const AVStream* audio,
                                            : nullptr}) {
         for (const char* key : keys) {
             if (const AVDictionaryEntry* e = av_dict_get(dict, key, nullptr, 0); e && *e->value) {
-                return e->value;
+                // RIFF INFO and some old taggers store bytes with no code page.
+                return DecodeUnlabelledText(e->value);
             }
         }
     }

@@ -1,6 +1,7 @@
 #include "platform/ChildProcess.h"
 
 #include "platform/CommandLine.h"
+#include "platform/PartFiles.h"
 
 #include <cerrno>
 #include <chrono>
@@ -195,6 +196,14 @@ void ImChildProcess::WaiterLoop() {
     int status = 0;
     while (::waitpid(pid, &status, 0) < 0 && errno == EINTR) {
     }
+    std::string outputPath;
+    {
+        std::lock_guard lock(m_mutex);
+        outputPath = m_outputPath;
+    }
+    // A tool that ended on its own has renamed or removed its part file; one that was killed or
+    // crashed has not. Removing before OnExit means the driver never sees the leftover.
+    RemovePartFile(outputPath, pid);
     if (!killed) {
         int code = 0;
         if (WIFEXITED(status))
@@ -229,12 +238,32 @@ bool ImChildProcess::Resume() {
     return ::kill(-m_pid, SIGCONT) == 0 || ::kill(m_pid, SIGCONT) == 0;
 }
 
-void ImChildProcess::Kill(int exitCode) {
-    std::unique_lock lock(m_mutex);
+void ImChildProcess::SetOutputPath(std::string path) {
+    std::lock_guard lock(m_mutex);
+    m_outputPath = std::move(path);
+}
+
+void ImChildProcess::RequestStop(int exitCode) {
+    std::lock_guard lock(m_mutex);
     if (m_pid <= 0 || m_exited)
         return;
     m_killed = true;
     m_exitCode = exitCode;
+    // A stopped child would never see the request; continue it first. The group goes too, so a
+    // tool that is a script with children ends as one.
+    for (int sig : {SIGCONT, SIGTERM}) {
+        ::kill(-m_pid, sig);
+        ::kill(m_pid, sig);
+    }
+}
+
+void ImChildProcess::Kill(int exitCode) {
+    RequestStop(exitCode);
+    std::unique_lock lock(m_mutex);
+    if (m_pid <= 0 || m_exited)
+        return;
+    if (m_exitedChanged.wait_for(lock, kTerminateGrace, [this] { return m_exited; }))
+        return;
     ::kill(-m_pid, SIGKILL);
     ::kill(m_pid, SIGKILL);
     m_exitedChanged.wait_for(lock, kKillWait, [this] { return m_exited; });

@@ -12,6 +12,7 @@
 // StopAndJoin() in its own destructor, so no hook runs on a half-destroyed object.
 
 #include <atomic>
+#include <chrono>
 #include <condition_variable>
 #include <mutex>
 #include <string>
@@ -23,6 +24,8 @@ namespace ac::platform {
 
 class ImChildProcess {
 public:
+    static constexpr std::chrono::milliseconds kTerminateGrace{2000};
+
     ImChildProcess() = default;
     virtual ~ImChildProcess();
     ImChildProcess(const ImChildProcess&) = delete;
@@ -38,9 +41,18 @@ public:
     // one or the signal could not be sent.
     virtual bool Suspend();
     virtual bool Resume();
-    // Forced end. The exit reported afterwards is exitCode, not the signal that ended the child.
-    // Does nothing for a child that is no longer running: its own exit code stays.
+    // Ending a child, the one way every driver does it: a paused child is continued, asked to
+    // end with SIGTERM (so the tool removes its part file itself) and killed only when it has
+    // not gone after kTerminateGrace. The exit reported afterwards is exitCode, not the signal.
+    // Both do nothing for a child that is no longer running: its own exit code stays.
+    // RequestStop only asks and returns at once; Kill waits for the end, killing when it must.
+    // A driver that stops many children asks them all first, then Kills each.
+    void RequestStop(int exitCode);
     void Kill(int exitCode);
+
+    // The output the child writes: once it has been reaped, whatever part file it left for
+    // that output is removed (PartFiles.h), also after a SIGKILL.
+    void SetOutputPath(std::string path);
 
     // Waits until the last run's waiter has called OnExit and all its threads are gone.
     void WaitForExit();
@@ -67,6 +79,7 @@ private:
     void CloseWakePipe();
 
     std::string m_currentDirectory;
+    std::string m_outputPath;  // guarded by m_mutex
 
     mutable std::mutex m_mutex;  // guards m_pid, m_exited, m_killed against pid reuse
     pid_t m_pid = -1;

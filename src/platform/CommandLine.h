@@ -6,6 +6,10 @@
 //
 //   ctt -relk -y  -i "/music/a b.wav" -title "My Song"   -vol  256   "/out/a b.mp3"
 //
+// A file name may hold 0x0B itself. So that every byte a name can hold reaches the tool
+// intact, 0x10 escapes: 0x10 'v' is a real 0x0B and 0x10 0x10 a real 0x10. Texts without either
+// byte, which is every text anybody types, read exactly as they always have.
+//
 // Thread contract: any thread.
 
 #include <string>
@@ -17,6 +21,14 @@ namespace ac::platform {
 // The character that stands for a double quote inside a quoted value.
 inline constexpr char kQuoteStandIn = '\x0B';
 
+inline constexpr char kValueEscape = '\x10';
+
 std::vector<std::string> SplitCommandLine(std::string_view text);
+
+// A value as it goes into the command text: in double quotes, with its quotes as 0x0B and the
+// two escapes above.
+std::string QuoteCommandValue(std::string_view value);
+// The value a word of the split text stands for: the reverse of the encoding inside the quotes.
+std::string RestoreCommandValue(std::string_view word);
 
 }  // namespace ac::platform

@@ -1,5 +1,6 @@
 // A set's records as ctt options. A parameter at its default is left out, so "Auto" and friends
 // never reach the tool and the tool's own defaults apply.
+#include "platform/CommandLine.h"
 #include "profile/Duration.h"
 #include "profile/ParameterSet.h"
 #include "profile/TextUtil.h"
@@ -9,7 +10,6 @@
 namespace ac {
 namespace {
 
-constexpr char kQuoteStandIn = '\x0B';  // the tool turns it back into a double quote
 
 bool IsDigit(char c) { return c >= '0' && c <= '9'; }
 
@@ -130,15 +130,13 @@ std::string ParameterSet::BuildCommandLine() {
                                                 : EqualsNoCase(record.value, record.defaultValue);
                 if (!atDefault) {
                     std::string value(TrimBlanks(record.value));
-                    for (char& c : value) {
-                        if (c == '"') c = kQuoteStandIn;
-                        if (!keepCase) c = AsciiLower(c);
-                    }
+                    if (!keepCase)
+                        for (char& c : value) c = AsciiLower(c);
                     text += '-';
                     text += record.name;
-                    text += " \"";
-                    text += value;
-                    text += "\" ";
+                    text += ' ';
+                    text += platform::QuoteCommandValue(value);
+                    text += ' ';
                 }
             }
         }

@@ -84,19 +84,7 @@ void CConvertMode::Start() {
     }
     // Settings are read once per run of the program; the naming keys may change in the
     // preferences, so they are read again for each row.
-    OutputNamer namer = [](int row, MediaItem& item, const std::string& directory,
-                           const std::string& lastOutput) {
-        ParameterSet* set = SetOf(item);
-        if (set == nullptr) {
-            return std::string();
-        }
-        OutputNameRequest request;
-        request.sourcePath = item.sourcePath;
-        request.row = row;
-        request.lastOutput = lastOutput;
-        request.directory = directory;
-        return MakeOutputPath(*set, request, ReadNamingSettings(GetAppConfig()));
-    };
+    OutputNamer namer = MakeRowNamer([] { return ReadNamingSettings(GetAppConfig()); });
     CommandBuilder builder = [](MediaItem& item) {
         ParameterSet* set = SetOf(item);
         if (set == nullptr) {
@@ -122,12 +110,16 @@ void CConvertMode::Shutdown() {
     // call into a driver that is gone, and one already calling must have finished: cut the
     // callbacks, end what still runs, and join every child's threads before the driver goes.
     if (g_MediaList != nullptr) {
-        for (MediaItem* item : g_MediaList->Items()) {
+        const std::vector<MediaItem*> items = g_MediaList->Items();
+        for (MediaItem* item : items) {
             if (CEncodeProcess* process = item->process.load()) {
                 process->ClearCallback();
-                if (process->IsRunning()) {
-                    process->Kill(65535);
-                }
+                process->RequestStop(65535);
+            }
+        }
+        for (MediaItem* item : items) {
+            if (CEncodeProcess* process = item->process.load()) {
+                process->Kill(65535);
                 process->WaitForExit();
             }
         }

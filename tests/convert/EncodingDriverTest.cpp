@@ -55,7 +55,7 @@ protected:
             [this](int, const MediaItem& item, const std::string& directory,
                    const std::string& lastOutput) {
                 lastOutputs.push_back(lastOutput);
-                return directory + "/" + fs::path(item.sourcePath).filename().string() + ".mp3";
+                return HoldOutputPath(directory + "/" + fs::path(item.sourcePath).filename().string() + ".mp3");
             },
             [](const MediaItem& item) {
                 return "-relk -y -i \"" + item.sourcePath + "\" \"" + item.outputPath + "\"";

@@ -11,12 +11,13 @@
 #include "convert/CommandLine.h"
 #include "convert/OutputNaming.h"
 #include "convert/RowParameters.h"
+#include "medialist/MediaListRules.h"
 #include "medialist/MediaProbe.h"
 #include "platform/Paths.h"
 #include "profile/ParameterSet.h"
 #include "resources/Package.h"
 #include "resources/PackageWriter.h"
-#include "rip/CueSheet.h"
+#include "rip/CueExpansion.h"
 #include "shell/AppConfig.h"
 
 #include <atomic>
@@ -166,22 +167,15 @@ void AddSource(console::ConsoleRun& run, const std::string& path, const Paramete
         run.AddRow(MakeRow(path, fs::path(path).stem().string(), profile));
         return;
     }
-    std::string diagnostics;
-    CueOutput quiet{&diagnostics, &diagnostics};
-    ParseCueSheet(path, quiet);
-    std::vector<std::string> titles;
-    if (g_CueSheet)
-        for (std::uint32_t i = 0; i < g_CueSheet->trackCount; ++i)
-            titles.emplace_back(g_CueSheet->tracks[i].title);
-    FreeCueSheet();
-    auto tracks = static_cast<std::uint32_t>(titles.size());
-    if (tracks == 0) {
-        std::fprintf(stderr, "acconvert: %s: no tracks in the cue sheet\n", path.c_str());
+    const CueExpansion sheet = ExpandCueSheet(path);
+    if (sheet.rows.empty()) {
+        std::fprintf(stderr, "acconvert: %s\n", sheet.error.c_str());
         run.AddRow(MakeRow(path, fs::path(path).stem().string(), profile));  // an unknown file
         return;
     }
-    for (std::uint32_t track = 1; track <= tracks; ++track)
-        run.AddRow(MakeRow(path + "|" + std::to_string(track), titles[track - 1], profile));
+    for (const CueRow& row : sheet.rows)
+        run.AddRow(MakeRow(row.trackPath, row.title.empty() ? GetDisplayName(row.trackPath) : row.title,
+                           profile));
 }
 
 }  // namespace
@@ -229,15 +223,7 @@ int main(int argc, char** argv) {
     for (const auto& file : options.files)
         AddSource(run, fs::absolute(file).lexically_normal().string(), *profile);
 
-    OutputNamer namer = [naming](int row, MediaItem& item, const std::string& directory,
-                                 const std::string& lastOutput) {
-        OutputNameRequest request;
-        request.sourcePath = item.sourcePath;
-        request.row = row;
-        request.lastOutput = lastOutput;
-        request.directory = directory;
-        return MakeOutputPath(*SetOf(item), request, naming);
-    };
+    OutputNamer namer = MakeRowNamer([naming] { return naming; });
     CommandBuilder builder = [](MediaItem& item) {
         return BuildConversionCommandText(item.sourcePath, item.outputPath, item.volume,
                                           *SetOf(item));

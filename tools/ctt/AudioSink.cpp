@@ -1,5 +1,7 @@
 #include "AudioSink.h"
 
+#include "platform/PartFiles.h"
+
 #include <strings.h>
 #include <unistd.h>
 
@@ -149,14 +151,7 @@ void SetTags(AVFormatContext* muxer, const std::map<std::string, std::string>& t
 }
 
 std::string TempPathFor(const std::string& output) {
-    namespace fs = std::filesystem;
-    fs::path out(output);
-    fs::path dir = out.parent_path();
-    // Beside the output, so the final rename stays on one file system; short enough for
-    // NAME_MAX even when the output's own name is near it.
-    std::string name = "." + out.filename().string().substr(0, 200) + ".ctt" +
-                       std::to_string(::getpid()) + ".part";
-    return (dir / name).string();
+    return ac::platform::PartFilePath(output, ::getpid());
 }
 
 }  // namespace

@@ -1,5 +1,7 @@
 #include "CttOptions.h"
 
+#include "platform/CommandLine.h"
+
 #include <algorithm>
 #include <cctype>
 #include <cstring>
@@ -123,11 +125,8 @@ std::string Trim(const std::string& s) {
     return s.substr(b, e - b + 1);
 }
 
-// The launcher carries a double quote inside a value as 0x0B.
-std::string RestoreQuotes(std::string s) {
-    std::replace(s.begin(), s.end(), '\x0B', '"');
-    return s;
-}
+// The launcher carries a double quote inside a value as 0x0B (platform/CommandLine.h).
+std::string RestoreQuotes(const std::string& s) { return ac::platform::RestoreCommandValue(s); }
 
 bool IsUnset(const std::string& lowered) {
     return lowered.empty() || lowered == "auto" || lowered == "full" || lowered == "default";
@@ -218,6 +217,9 @@ std::optional<std::int64_t> ParseDurationUs(const std::string& raw) {
             return std::nullopt;
         }
         seconds = seconds * 60 + fieldValues[k];
+        if (seconds > kMaxDurationSeconds) {
+            return std::nullopt;
+        }
     }
     std::int64_t us = seconds * 1000000 + fractionUs;
     return negative ? -us : us;
@@ -338,7 +340,7 @@ std::string ApplyValue(CttOptions& o, const std::string& name, const std::string
     } else if (name == "t" || name == "ss" || name == "itsoffset") {
         auto us = ParseDurationUs(value);
         if (!us || (name != "itsoffset" && *us < 0)) {
-            return bad("expected H:M:S or seconds");
+            return bad("expected H:M:S or seconds, at most 1000 hours");
         }
         (name == "t" ? o.durationUs : name == "ss" ? o.startUs : o.tsOffsetUs) = *us;
     } else if (name == "timestamp" || name == "title" || name == "author" ||

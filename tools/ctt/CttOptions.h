@@ -50,8 +50,13 @@ struct ParseResult {
 // words: argv without the program name.
 ParseResult ParseArguments(const std::vector<std::string>& words);
 
+// 1000 hours: longer than any medium holds; the bound keeps the microsecond arithmetic far
+// from overflow. The option error names it.
+inline constexpr std::int64_t kMaxDurationSeconds = 1000 * 3600;
+
 // Durations: "H:M:S[.frac]", "M:S", or seconds with a fraction; a leading "-" negates.
-// "full", "auto" and "" mean "not set" (0). nullopt for anything else.
+// "full", "auto" and "" mean "not set" (0). nullopt for anything else, and for more than
+// kMaxDurationSeconds.
 std::optional<std::int64_t> ParseDurationUs(const std::string& text);
 
 // The codec words of the profiles mapped to FFmpeg encoders (mp3 -> libmp3lame, ...);

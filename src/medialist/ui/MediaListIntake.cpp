@@ -2,6 +2,7 @@
 // Probing runs here on the UI thread, one file after the other.
 #include "convert/RowParameters.h"
 #include "medialist/CueSheet.h"
+#include "rip/CueExpansion.h"
 #include "medialist/MediaListRules.h"
 #include "medialist/MediaProbe.h"
 #include "medialist/ui/MediaListWnd.h"
@@ -32,15 +33,6 @@ std::string LowerText(std::string text) {
     std::transform(text.begin(), text.end(), text.begin(),
                    [](unsigned char c) { return static_cast<char>(std::tolower(c)); });
     return text;
-}
-
-bool ReadWholeFile(const std::string& path, std::string& bytes) {
-    std::ifstream in(path, std::ios::binary);
-    if (!in) {
-        return false;
-    }
-    bytes.assign(std::istreambuf_iterator<char>(in), std::istreambuf_iterator<char>());
-    return true;
 }
 
 // Lets paint and size events through so a long sheet keeps the window alive, but no input:
@@ -141,22 +133,24 @@ int CMediaListWnd::AddCueTrack(const std::string& trackPath, const std::string& 
 }
 
 int CMediaListWnd::AddCueSheet(const std::string& sheetPath, int position) {
-    std::string bytes;
-    if (!ReadWholeFile(sheetPath, bytes)) {
-        return -1;
-    }
-    const CueSheetData sheet = ParseCueSheet(bytes);
-    if (sheet.tracks.empty()) {
-        return -1;
-    }
+    const CueExpansion sheet = ExpandCueSheet(sheetPath);
     IMainHub* hub = GetMainHub();
-    const int first = position;
-    for (std::size_t i = 0; i < sheet.tracks.size(); ++i) {
-        const std::string trackPath = sheetPath + "|" + std::to_string(i + 1);
+    if (sheet.rows.empty()) {
+        // The sheet still gets its row, marked unknown, as any file that cannot be read does;
+        // the status text says why.
         if (hub != nullptr) {
-            hub->SetStatusText(FormatText(g_Language.GetString(0xC040), {trackPath}));
+            hub->SetStatusText(sheet.error);
         }
-        if (AddCueTrack(trackPath, sheet.tracks[i].title, position) < 0) {
+        std::unique_ptr<MediaItem> item = MakeItem(sheetPath);
+        item->SetStatus(JobStatus::UnknownFile);
+        return InsertRow(position, std::move(item), GetDisplayName(sheetPath), "cue");
+    }
+    const int first = position;
+    for (const CueRow& row : sheet.rows) {
+        if (hub != nullptr) {
+            hub->SetStatusText(FormatText(g_Language.GetString(0xC040), {row.trackPath}));
+        }
+        if (AddCueTrack(row.trackPath, row.title, position) < 0) {
             break;
         }
         ++position;
