@@ -17,8 +17,10 @@ if(AC_ASAN)
 endif()
 if(AC_FUZZ)
   # Every library carries coverage for libFuzzer; the fuzz executables add the driver.
+  # Every finding is fatal, so libFuzzer saves the input and the run reports it: undefined
+  # behaviour that only printed a line would be lost.
   target_compile_options(ac_options INTERFACE -fsanitize=fuzzer-no-link,address,undefined
-                         -fno-omit-frame-pointer)
+                         -fno-omit-frame-pointer -fno-sanitize-recover=all)
   target_link_options(ac_options INTERFACE -fsanitize=address,undefined)
 endif()
 if(AC_TSAN)

@@ -3,7 +3,9 @@
 
 #include "platform/ChildProcess.h"
 
+#include "../support/RunTool.h"
 #include "../support/TempDir.h"
+#include "platform/PartFiles.h"
 #include "FakeTool.h"
 
 #include <gtest/gtest.h>
@@ -44,9 +46,10 @@ private:
     std::string m_output;
 };
 
-// One second of 16-bit stereo silence at 44.1 kHz.
-void WriteWav(const std::string& path, int seconds = 1) {
-    const std::uint32_t rate = 44100, channels = 2, bytes = rate * channels * 2 * seconds;
+// Seconds of 16-bit silence, stereo at 44.1 kHz unless told otherwise.
+void WriteWav(const std::string& path, int seconds = 1, std::uint32_t rate = 44100,
+              std::uint32_t channels = 2) {
+    const std::uint32_t bytes = rate * channels * 2 * static_cast<std::uint32_t>(seconds);
     std::ofstream out(path, std::ios::binary);
     auto u32 = [&](std::uint32_t v) { out.write(reinterpret_cast<const char*>(&v), 4); };
     auto u16 = [&](std::uint16_t v) { out.write(reinterpret_cast<const char*>(&v), 2); };
@@ -98,6 +101,29 @@ protected:
             names.push_back(entry.path().filename());
         std::sort(names.begin(), names.end());
         return names;
+    }
+    // The argument list for RunTool, where words need no quoting.
+    std::vector<std::string> Argv(const std::vector<std::string>& files, int jobs = 2) {
+        std::vector<std::string> argv = {"--profile", profile, "--jobs", std::to_string(jobs), "--out", out};
+        argv.insert(argv.end(), files.begin(), files.end());
+        return argv;
+    }
+    static bool HasCtt() { return ::access(kCtt.c_str(), X_OK) == 0; }
+    // Waits until `count` part files stand in the output folder and answers their writers.
+    std::vector<int> WaitForPartFiles(std::size_t count) {
+        for (int i = 0; i < 3000; ++i) {
+            std::vector<int> pids;
+            for (auto& entry : fs::directory_iterator(out)) {
+                const std::string name = entry.path().filename();
+                const std::size_t tag = name.rfind(".ctt");
+                if (name.ends_with(".part") && tag != std::string::npos)
+                    pids.push_back(std::atoi(name.c_str() + tag + 4));
+            }
+            if (pids.size() >= count)
+                return pids;
+            std::this_thread::sleep_for(std::chrono::milliseconds(10));
+        }
+        return {};
     }
     test::TempDir dir;
     std::string out = dir / "out";
@@ -164,6 +190,92 @@ TEST_F(AcconvertTest, RealConversionsOfFilesAndCueTracks) {
         << program.Output();
     for (const auto& name : Outputs())
         EXPECT_GT(fs::file_size(out + "/" + name), 0u) << name;
+}
+
+// Inputs that all map to one output name, run four at a time, and names holding every byte a
+// file name can: each converts into a file of its own.
+TEST_F(AcconvertTest, EveryInputGetsItsOwnCompleteOutputWhateverItsName) {
+    if (!HasCtt())
+        GTEST_SKIP() << "ctt is not built";
+    std::vector<std::string> files;
+    for (int i = 0; i < 12; ++i) {
+        fs::create_directories(dir / ("d" + std::to_string(i)));
+        files.push_back(dir / ("d" + std::to_string(i)) + "/same.wav");
+        WriteWav(files.back());
+    }
+    const std::vector<std::string> hostile = {"12\" Mix", "it's \"quoted\"", "back\\slash",
+                                              "new\nline", "-dash", "bad\xff\xfe", "vt\x0B\x10"};
+    for (const std::string& name : hostile) {
+        files.push_back(dir / (name + ".wav"));
+        WriteWav(files.back());
+    }
+    const test::ToolResult run = test::RunTool(kAcconvert, Argv(files, 4), 300);
+    EXPECT_EQ(run.exitCode, 0) << run.out << run.err;
+    const std::vector<std::string> names = Outputs();
+    EXPECT_EQ(names.size(), files.size()) << run.out;
+    for (int i = 0; i < 12; ++i) {
+        const std::string name = i == 0 ? "same.mp3" : "same-" + std::to_string(i) + ".mp3";
+        EXPECT_TRUE(std::count(names.begin(), names.end(), name)) << name;
+    }
+    // The illegal characters of a name are dropped; every other byte stays.
+    for (const char* name : {"12\" Mix.mp3", "backslash.mp3", "new\nline.mp3", "bad\xff\xfe.mp3", "vt\x0B\x10.mp3"})
+        EXPECT_TRUE(std::count(names.begin(), names.end(), name)) << name;
+    for (const std::string& name : names)
+        EXPECT_GT(fs::file_size(out + "/" + name), 1000u) << name;
+}
+
+// Stopped by Ctrl-C, by kill, or killed outright: the tools end and no part file stays.
+TEST_F(AcconvertTest, AStoppedOrKilledRunLeavesNothingInTheOutputFolder) {
+    if (!HasCtt())
+        GTEST_SKIP() << "ctt is not built";
+    WriteWav(dir / "long.wav", 240);
+    for (int signal : {SIGINT, SIGTERM, SIGKILL}) {
+        Program program;
+        ASSERT_TRUE(program.Launch(Args({dir / "long.wav", dir / "long.wav"})));
+        const std::vector<int> writers = WaitForPartFiles(2);
+        ASSERT_EQ(writers.size(), 2u) << program.Output();
+        ::kill(program.ProcessId(), signal);
+        program.WaitForExit();
+        if (signal != SIGKILL) {
+            EXPECT_EQ(program.ExitCode(), 130) << program.Output();
+        }
+        // Orphaned by SIGKILL, a tool notices at its next progress line that nobody reads.
+        for (int pid : writers)
+            EXPECT_TRUE(test::WaitForProcessState(pid, '?') || test::ProcessState(pid) == 'Z') << pid;
+        EXPECT_TRUE(Outputs().empty()) << signal << ": " << (Outputs().empty() ? "" : Outputs()[0]);
+    }
+}
+
+// A tool that ignores the request to end is killed after the grace period; its part file goes.
+TEST_F(AcconvertTest, AToolThatIgnoresTheStopIsKilledAndItsPartFileRemoved) {
+    UseFakeTool("trap '' TERM\nfor last; do :; done\n: > \"$(dirname \"$last\")/.$(basename \"$last\").ctt$$.part\"\n"
+                "echo started >> '" + dir / "log" + "'\nwhile :; do sleep 0.05; done\n");
+    WriteWav(dir / "a.wav");
+    Program program;
+    ASSERT_TRUE(program.Launch(Args({dir / "a.wav"})));
+    ASSERT_EQ(WaitForPartFiles(1).size(), 1u) << program.Output();
+    ::kill(program.ProcessId(), SIGINT);
+    program.WaitForExit();
+    EXPECT_EQ(program.ExitCode(), 130) << program.Output();
+    EXPECT_TRUE(Outputs().empty());
+}
+
+// A real ripper's sheet that the strict reader refuses (REM DATE 1991) still gives its tracks,
+// in Windows-1252 as the ripper wrote it.
+TEST_F(AcconvertTest, RealCueSheetsRefusedByTheStrictReaderConvertTrackByTrack) {
+    if (!HasCtt())
+        GTEST_SKIP() << "ctt is not built";
+    fs::copy_file(std::string(AC_CORPUS_DIR) + "/cue/rcue_good.cue", dir / "album.cue");
+    WriteWav(dir / "My Bloody Valentine - Loveless.wav", 262, 8000, 1);
+    const test::ToolResult run = test::RunTool(kAcconvert, Argv({dir / "album.cue"}), 300);
+    EXPECT_EQ(run.exitCode, 0) << run.out << run.err;
+    EXPECT_EQ(Outputs(), (std::vector<std::string>{"Loomer.mp3", "Only Shallow.mp3"})) << run.out;
+    // A sheet that neither reader reads names itself and the line.
+    std::ofstream(dir / "junk.cue") << "THIS IS\nNOT A SHEET\n";
+    const test::ToolResult junk = test::RunTool(kAcconvert, Argv({dir / "junk.cue"}), 60);
+    EXPECT_EQ(junk.exitCode, 1);
+    EXPECT_NE(junk.err.find(dir / "junk.cue"), std::string::npos) << junk.err;
+    EXPECT_NE(junk.err.find("line 2"), std::string::npos) << junk.err;
 }
 
 }  // namespace

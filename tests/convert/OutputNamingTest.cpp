@@ -5,6 +5,8 @@
 #include <gtest/gtest.h>
 
 #include <set>
+#include <thread>
+#include <vector>
 
 #include "../support/TempDir.h"
 #include "profile/ParameterSet.h"
@@ -94,6 +96,51 @@ TEST_F(OutputPath, DefaultsUseTheRowNameAndAFreeNumber) {
     m_existing = {"/out/Song.mp3"};
     m_settings.outputFileOverwrite = 1;
     EXPECT_EQ(Make("Song.mp3"), "/out/Song.mp3");
+}
+
+// A name held by a job still writing is taken, whatever the disk says and also when the user
+// allows overwriting: that replaces a file of an earlier run, never a sibling's output.
+TEST_F(OutputPath, NamesHeldByRunningJobsAreTaken) {
+    m_set.SetValue("outfilename", "Song.mp3");
+    ac::OutputNameRequest request;
+    request.directory = "/out";
+    auto none = [](const std::string&) { return false; };
+    ac::OutputHold first = ac::ReserveOutputPath(m_set, request, m_settings, none);
+    ac::OutputHold second = ac::ReserveOutputPath(m_set, request, m_settings, none);
+    EXPECT_EQ(first.Path(), "/out/Song.mp3");
+    EXPECT_EQ(second.Path(), "/out/Song-1.mp3");
+    EXPECT_TRUE(ac::IsOutputHeld("/out/SONG.mp3"));
+    m_settings.outputFileOverwrite = 1;
+    EXPECT_EQ(Make("Song.mp3"), "/out/Song-2.mp3");
+    first.Release();
+    EXPECT_EQ(Make("Song.mp3"), "/out/Song.mp3");
+    {
+        ac::OutputHold moved = std::move(second);
+        EXPECT_TRUE(second.Empty());
+    }
+    EXPECT_FALSE(ac::IsOutputHeld("/out/Song-1.mp3"));
+}
+
+// Drivers on several threads (the burn list's workers) never take one name twice.
+TEST(OutputHolds, ReservationsFromManyThreadsAreDistinct) {
+    constexpr int kThreads = 8, kEach = 50;
+    std::vector<std::vector<ac::OutputHold>> holds(kThreads);
+    std::vector<std::thread> threads;
+    for (int t = 0; t < kThreads; ++t) {
+        threads.emplace_back([&holds, t] {
+            RowSet set;
+            set.SetValue("outfilename", "Same.wav");
+            ac::OutputNameRequest request;
+            request.directory = "/tmp/none";
+            for (int i = 0; i < kEach; ++i)
+                holds[t].push_back(ac::ReserveOutputPath(set, request, {}, [](const std::string&) { return false; }));
+        });
+    }
+    for (auto& thread : threads) thread.join();
+    std::set<std::string> names;
+    for (const auto& list : holds)
+        for (const auto& hold : list) names.insert(hold.Path());
+    EXPECT_EQ(names.size(), static_cast<std::size_t>(kThreads * kEach));
 }
 
 TEST_F(OutputPath, EmptyNameFallsBackToTheSource) {

@@ -1,11 +1,14 @@
 #include "platform/ChildProcess.h"
 
+#include "platform/PartFiles.h"
+
 #include "../convert/FakeTool.h"
 #include "../support/TempDir.h"
 
 #include <gtest/gtest.h>
 
 #include <chrono>
+#include <filesystem>
 #include <fstream>
 #include <mutex>
 #include <thread>
@@ -136,6 +139,75 @@ TEST_F(ChildProcessTest, RelaunchesLeaveNoDescriptorsOrZombies) {
     EXPECT_EQ(child.Exits().size(), 21u);
     // Every child was reaped by its waiter.
     EXPECT_EQ(::waitpid(-1, nullptr, WNOHANG), -1);
+}
+
+// The tool's own way out: asked with SIGTERM, it removes its part file and ends. A paused
+// tool must be continued first, or it would never see the request.
+TEST_F(ChildProcessTest, APausedChildIsAskedToEndAndCleansUpItself) {
+    Capture child;
+    const std::string part = dir / "part";
+    const std::string cleaned = dir / "cleaned";
+    ASSERT_TRUE(child.Launch(Tool(": > '" + part + "'; trap \"rm -f '" + part + "'; : > '" + cleaned +
+                                  "'; exit 1\" TERM\nwhile :; do sleep 0.05; done\n")));
+    const int pid = child.ProcessId();
+    while (!std::ifstream(part).good()) std::this_thread::sleep_for(std::chrono::milliseconds(5));
+    ASSERT_TRUE(child.Suspend());
+    ASSERT_TRUE(test::WaitForProcessState(pid, 'T'));
+    child.Kill(65535);
+    child.WaitForExit();
+    EXPECT_EQ(child.Exits(), std::vector<int>{65535});
+    EXPECT_TRUE(std::ifstream(cleaned).good()) << "the tool was killed, not asked";
+    EXPECT_FALSE(std::ifstream(part).good());
+}
+
+// A tool that ignores the request is killed after the grace period, and the part file it left
+// for its output is removed once it has been reaped.
+TEST_F(ChildProcessTest, AToolThatIgnoresTheRequestIsKilledAndItsPartFileRemoved) {
+    Capture child;
+    const std::string output = dir / "Song.mp3";
+    child.SetOutputPath(output);
+    ASSERT_TRUE(child.Launch(Tool("trap '' TERM; : > \"" + dir.Path() +
+                                  "/.Song.mp3.ctt$$.part\"; echo ready\nwhile :; do sleep 0.05; done\n")));
+    while (child.Out().empty()) std::this_thread::sleep_for(std::chrono::milliseconds(5));
+    const std::string part = PartFilePath(output, child.ProcessId());
+    ASSERT_TRUE(std::ifstream(part).good());
+    const auto started = std::chrono::steady_clock::now();
+    child.Kill(65535);
+    child.WaitForExit();
+    EXPECT_GE(std::chrono::steady_clock::now() - started, ImChildProcess::kTerminateGrace / 2);
+    EXPECT_EQ(child.Exits(), std::vector<int>{65535});
+    EXPECT_FALSE(std::ifstream(part).good());
+}
+
+// Part files of tools that died with an earlier program go; those of a tool still writing stay,
+// and so does everything that is no part file.
+TEST_F(ChildProcessTest, StalePartFilesAreSweptAndLiveOnesKept) {
+    namespace fs = std::filesystem;
+    const std::string folder = dir / "out";
+    fs::create_directories(folder);
+    // A dead pid: a child that has been reaped.
+    Capture dead;
+    ASSERT_TRUE(dead.Launch(Tool("exit 0\n")));
+    dead.WaitForExit();
+    const int deadPid = dead.ProcessId();
+    // A live process that is the tool (named ctt), and a live one that is not.
+    fs::copy_file("/bin/sleep", dir / "ctt");
+    Capture tool, stranger;
+    ASSERT_TRUE(tool.Launch("\"" + dir / "ctt" + "\" 60"));
+    ASSERT_TRUE(stranger.Launch("/bin/sleep 60"));
+    const std::string a = PartFilePath(folder + "/a.mp3", deadPid);
+    const std::string b = PartFilePath(folder + "/b.mp3", tool.ProcessId());
+    const std::string c = PartFilePath(folder + "/c.mp3", stranger.ProcessId());
+    for (const std::string& path : {a, b, c, folder + "/.x.ctt12.partial", folder + "/d.mp3"})
+        std::ofstream(path) << "x";
+    EXPECT_EQ(SweepStalePartFiles(folder), 2);
+    EXPECT_FALSE(fs::exists(a));
+    EXPECT_TRUE(fs::exists(b));
+    EXPECT_FALSE(fs::exists(c));
+    EXPECT_TRUE(fs::exists(folder + "/.x.ctt12.partial"));
+    EXPECT_TRUE(fs::exists(folder + "/d.mp3"));
+    tool.Kill(65535);
+    stranger.Kill(65535);
 }
 
 }  // namespace
