@@ -51,9 +51,15 @@ CueExpansion ExpandCueSheet(const std::string& sheetPath) {
         }
         FreeCueSheet();
     }
+    const CueSheetData lenient = ParseCueSheet(std::string_view(bytes));
     if (titles.empty()) {
-        const CueSheetData lenient = ParseCueSheet(std::string_view(bytes));
         for (const CueSheetTrack& track : lenient.tracks) titles.push_back(track.title);
+    } else if (titles.size() == lenient.tracks.size()) {
+        // The strict reader keeps 64 bytes of a title; the lenient one has the rest.
+        for (std::size_t i = 0; i < titles.size(); ++i) {
+            const std::string& whole = lenient.tracks[i].title;
+            if (whole.size() > titles[i].size() && whole.starts_with(titles[i])) titles[i] = whole;
+        }
     }
     for (std::size_t i = 0; i < titles.size(); ++i)
         expansion.rows.push_back({sheetPath + "|" + std::to_string(i + 1), std::move(titles[i])});

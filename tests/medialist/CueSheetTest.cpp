@@ -1,5 +1,7 @@
 #include "medialist/CueSheet.h"
 
+#include "medialist/TextDecoding.h"
+
 #include <gtest/gtest.h>
 
 #include <filesystem>
@@ -194,6 +196,40 @@ TEST_F(CueResolve, TitlesFallBackToTheSheet) {
     EXPECT_EQ(span.date, "1999");
     EXPECT_EQ(span.endFrame, 750);
     EXPECT_FALSE(ResolveCueTrack(m_dir / "none.cue", 1, span, error));
+}
+
+// Sheets in the code page their file names give read as that code page. Windows-1252 is the
+// case that went wrong: its curly apostrophe was taken for a Shift-JIS lead byte.
+struct CodePageCase {
+    const char* file;
+    const char* codePage;
+    const char* sample;  // a text the decoded sheet must hold
+};
+
+class CueCodePages : public ::testing::TestWithParam<CodePageCase> {};
+
+TEST_P(CueCodePages, DecodeAsTheirCodePage) {
+    const CodePageCase& c = GetParam();
+    const std::string bytes = ReadFile(std::string(AC_CORPUS_DIR) + "/cue/" + c.file);
+    const std::string text = DecodeCueText(bytes);
+    EXPECT_EQ(text, ConvertToUtf8(bytes, c.codePage));
+    EXPECT_NE(text.find(c.sample), std::string::npos);
+}
+
+INSTANTIATE_TEST_SUITE_P(
+    Corpus, CueCodePages,
+    ::testing::Values(CodePageCase{"cuebreaker_shift_jis.cue", "SHIFT_JIS", "テストアルバム"},
+                      CodePageCase{"cuesheetnet_1252.cue", "WINDOWS-1252", "Wond’ring Aloud"},
+                      CodePageCase{"deflacue_vys2_cp1251.cue", "WINDOWS-1251", "Высоцкий"},
+                      CodePageCase{"flacon_ru_cp1251.cue", "WINDOWS-1251", "Супер группа"},
+                      CodePageCase{"ffcuesplitter_Three_Samples_ISO-8859-1.cue", "ISO-8859-1", "300 Hz"}));
+
+TEST(TextDecoding, TagsWithoutACodePage) {
+    EXPECT_EQ(DecodeUnlabelledText("plain"), "plain");
+    EXPECT_EQ(DecodeUnlabelledText("Ærø – ok"), "Ærø – ok");  // valid UTF-8 stays
+    EXPECT_EQ(DecodeUnlabelledText("caf\xe9 \x93quoted\x94"), "café “quoted”");
+    // Not a single byte is lost or left invalid, whatever the guess.
+    EXPECT_TRUE(IsValidUtf8(DecodeUnlabelledText(std::string("\x80\x81\xfe\xff\x00z", 6))));
 }
 
 }  // namespace
