@@ -144,6 +144,61 @@ TEST_F(ConvertWindowTest, EncodesAddedFilesAndAsksBeforeEncodingThemAgain) {
     EXPECT_TRUE(AllRowsAre(program.ReadState(), kCompleted, 2));
 }
 
+// Two jobs at a time, three sources of one name: the third starts while the second still
+// writes its hidden part file, and must not take the second's name. Then Stop during a run of
+// two leaves nothing in the output folder.
+TEST_F(ConvertWindowTest, RunningJobsNeverShareANameAndStopLeavesNothingBehind) {
+    ac::test::WriteSettings(m_home, "max_running_processes=dword:2\nmax_processes=dword:2\n");
+    std::vector<std::string> sources;
+    for (double seconds : {1.0, 40.0, 1.0}) {
+        const std::string folder = "d" + std::to_string(sources.size());
+        std::filesystem::create_directories(m_home / ("in/" + folder));
+        sources.push_back(Wav(folder + "/a.wav", seconds, 30 + static_cast<std::uint32_t>(sources.size())));
+    }
+    Program program(m_home);
+    program.WaitShown();
+    const std::string out = m_home / "out";
+    program.Send("outdir " + out);
+    for (const std::string& source : sources) {
+        program.Send("add " + source);
+    }
+    program.WaitFor([](const State& s) { return Rows(s).size() == 3; });
+    program.Send("command 32776");
+    State state = program.WaitFor([](const State& s) { return AllRowsAre(s, kCompleted, 3); }, 90s);
+    ASSERT_TRUE(AllRowsAre(state, kCompleted, 3)) << state["row0"] << " / " << state["row2"];
+    EXPECT_NEAR(ProbedSeconds(out + "/a.mp3"), 1.0, 0.1);
+    EXPECT_NEAR(ProbedSeconds(out + "/a-1.mp3"), 40.0, 0.1);
+    EXPECT_NEAR(ProbedSeconds(out + "/a-2.mp3"), 1.0, 0.1);
+
+    program.Send("command 32773");  // Clear
+    program.WaitFor([](const State& s) { return Rows(s).empty(); });
+    const std::string longOne = Wav("long one.wav", 240.0, 40);
+    const std::string longTwo = Wav("long two.wav", 240.0, 41);
+    program.Send("add " + longOne);
+    program.Send("add " + longTwo);
+    program.WaitFor([](const State& s) { return Rows(s).size() == 2; });
+    program.Send("command 32776");
+    auto partFiles = [&] {
+        int count = 0;
+        for (const auto& entry : std::filesystem::directory_iterator(out)) {
+            count += entry.path().filename().string().ends_with(".part");
+        }
+        return count;
+    };
+    state = program.WaitFor([&](const State& s) { return AllRowsAre(s, kRunning, 2) && partFiles() == 2; });
+    ASSERT_TRUE(AllRowsAre(state, kRunning, 2));
+    program.Send("answer yes");
+    program.Send("command 32778");
+    state = program.WaitFor([](const State& s) { return AllRowsAre(s, kAborted, 2); });
+    EXPECT_TRUE(AllRowsAre(state, kAborted, 2));
+    std::vector<std::string> left;
+    for (const auto& entry : std::filesystem::directory_iterator(out)) {
+        left.push_back(entry.path().filename());
+    }
+    std::sort(left.begin(), left.end());
+    EXPECT_EQ(left, (std::vector<std::string>{"a-1.mp3", "a-2.mp3", "a.mp3"}));
+}
+
 TEST_F(ConvertWindowTest, UnreadableFilesAndCueSheetsBecomeRows) {
     const std::string junk = m_home / "in/not audio.mp3";
     std::ofstream(junk) << "this is no MPEG stream";
