@@ -210,6 +210,8 @@ TEST_F(MediaListWindowTest, CueSheetExpandsIntoOneRowPerTrack) {
     test::WriteFile(m_dir.Path() + "/empty.cue", "REM nothing\n");
     EXPECT_EQ(m_list->AddFile(m_dir.Path() + "/empty.cue", -1), -1);
     EXPECT_EQ(m_list->GetRowCount(), 3) << "a sheet without tracks adds nothing";
+    EXPECT_EQ(m_hub.statusTexts.back().rfind(m_dir.Path() + "/empty.cue: Parse error on line ", 0), 0u)
+        << m_hub.statusTexts.back();
 }
 
 TEST_F(MediaListWindowTest, CheckBoxesHeaderAndCommandRules) {

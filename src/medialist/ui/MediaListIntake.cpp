@@ -136,14 +136,11 @@ int CMediaListWnd::AddCueSheet(const std::string& sheetPath, int position) {
     const CueExpansion sheet = ExpandCueSheet(sheetPath);
     IMainHub* hub = GetMainHub();
     if (sheet.rows.empty()) {
-        // The sheet still gets its row, marked unknown, as any file that cannot be read does;
-        // the status text says why.
+        // No track, no row; the status text names the sheet and the line that stopped it.
         if (hub != nullptr) {
             hub->SetStatusText(sheet.error);
         }
-        std::unique_ptr<MediaItem> item = MakeItem(sheetPath);
-        item->SetStatus(JobStatus::UnknownFile);
-        return InsertRow(position, std::move(item), GetDisplayName(sheetPath), "cue");
+        return -1;
     }
     const int first = position;
     for (const CueRow& row : sheet.rows) {
