@@ -325,7 +325,10 @@ TEST_F(EncodingDriverTest, OutputDirectoryRemovedMidRunIsMadeAgainForTheNextRow)
     ASSERT_TRUE(DriveTo(first, JobStatus::Running));
     // No pass may run (and make the folder again) until the first child has hit the hole.
     list.m_listLock.lock();
-    fs::remove_all(out);
+    // The running child may be writing into the folder while it goes; try until it is gone.
+    std::error_code busy;
+    for (int i = 0; i < 100 && (fs::remove_all(out, busy), fs::exists(out)); ++i)
+        std::this_thread::sleep_for(std::chrono::milliseconds(5));
     OpenGate("gate.wav");
     for (int i = 0; i < 2000 && first.Status() == JobStatus::Running; ++i)
         std::this_thread::sleep_for(std::chrono::milliseconds(5));
