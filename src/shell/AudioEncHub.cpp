@@ -82,11 +82,31 @@ void CAudioEncDlg::OnListSelectionChanged(int row) {
             }
             process->ReplayErrorLines();
         }
+        ShowRowReason(*selected);
     }
     if (g_MediaList->SelectedSets().size() < 2) {
         HandOverSelectedSets();
     } else if (!m_selectionTimer.IsRunning()) {
         m_selectionTimer.StartOnce(500);
+    }
+}
+
+// A failed or unreadable row says why where the user looks first: the status text, and the log
+// behind the button beside it.
+void CAudioEncDlg::ShowRowReason(MediaItem& item) {
+    if (g_StatusWnd == nullptr) {
+        return;
+    }
+    const JobStatus status = item.Status();
+    if (status == JobStatus::UnknownFile && !item.info.probeError.empty()) {
+        g_StatusWnd->Append(item.info.probeError + "\n", LogLineKind::Error);
+        g_StatusWnd->SetStatusText(item.info.probeError);
+    } else if (status == JobStatus::Failed) {
+        CEncodeProcess* process = item.process.load();
+        const std::vector<std::string> lines = process ? process->ErrorLines() : std::vector<std::string>();
+        if (!lines.empty()) {
+            g_StatusWnd->SetStatusText(lines.front());
+        }
     }
 }
 
@@ -253,6 +273,10 @@ double CAudioEncDlg::RunDoneSeconds() {
 
 double CAudioEncDlg::RunTotalSeconds() {
     return m_convert && m_convert->Driver() ? m_convert->Driver()->GetRunTotalSeconds() : 0.0;
+}
+
+std::string CAudioEncDlg::RunProgressText() {
+    return m_convert ? m_convert->RunProgressText() : std::string();
 }
 
 }  // namespace ac

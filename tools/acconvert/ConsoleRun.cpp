@@ -111,6 +111,8 @@ void ConsoleRun::ReportEnded(int row, JobStatus status, int overall) {
         if (CEncodeProcess* child = item->process.load())
             for (const auto& line : child->ErrorLines())
                 std::fprintf(stderr, "    %s\n", line.c_str());
+    } else if (status == JobStatus::UnknownFile && !item->info.probeError.empty()) {
+        std::fprintf(stderr, "    %s\n", item->info.probeError.c_str());
     }
 }
 
