@@ -102,10 +102,8 @@ void CAudioEncDlg::ShowRowReason(MediaItem& item) {
         g_StatusWnd->Append(item.info.probeError + "\n", LogLineKind::Error);
         g_StatusWnd->SetStatusText(item.info.probeError);
     } else if (status == JobStatus::Failed) {
-        CEncodeProcess* process = item.process.load();
-        const std::vector<std::string> lines = process ? process->ErrorLines() : std::vector<std::string>();
-        if (!lines.empty()) {
-            g_StatusWnd->SetStatusText(lines.front());
+        if (CEncodeProcess* process = item.process.load()) {
+            g_StatusWnd->SetStatusText(process->FailureReason());
         }
     }
 }
