@@ -54,6 +54,21 @@ std::vector<std::string> CEncodeProcess::ErrorLines() const {
     return m_errorLines;
 }
 
+std::string CEncodeProcess::FailureReason() const {
+    const std::vector<std::string> lines = ErrorLines();
+    for (const std::string& line : lines) {
+        if (std::string_view(line).starts_with(kErrorPrefix)) {
+            return line.substr(kErrorPrefix.size());
+        }
+    }
+    if (!lines.empty()) {
+        std::string_view first = lines.front();
+        if (first.starts_with(kWarningPrefix)) first.remove_prefix(kWarningPrefix.size());
+        return std::string(first);
+    }
+    return "the conversion tool ended with exit code " + std::to_string(ExitCode());
+}
+
 void CEncodeProcess::Link(IProcessLog* log, IStatusText* status) {
     std::lock_guard lock(m_mutex);
     m_log = log;

@@ -77,6 +77,9 @@ public:
     double TimeSeconds() const { return m_timeSeconds.load(); }
     int ErrorReads() const { return m_errorReads.load(); }
     std::vector<std::string> ErrorLines() const;
+    // Why the last run failed, in one line: its first error without the tool's prefix, else
+    // its first line on the error stream, else the exit code.
+    std::string FailureReason() const;
 
     void Link(IProcessLog* log, IStatusText* status);
     // Shows the stored error lines of the last run again in the linked log.

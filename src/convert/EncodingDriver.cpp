@@ -4,6 +4,7 @@
 #include "resources/Language.h"
 #include "resources/TextFormat.h"
 
+#include <algorithm>
 #include <chrono>
 #include <filesystem>
 
@@ -463,14 +464,35 @@ double EncodingDriver::GetRunDoneSeconds() {
         MediaItem* item = m_list.GetItem(row);
         if (!item || item->inRun != 1)
             continue;
-        JobStatus s = item->Status();
+        const JobStatus s = item->Status();
+        const double duration = GetEffectiveDuration(*item);
         CEncodeProcess* child = item->process.load();
-        if (s == JobStatus::Failed)
-            done += GetEffectiveDuration(*item);
-        else if ((s == JobStatus::Running || s == JobStatus::Completed) && child)
-            done += child->TimeSeconds();
+        // A finished row counts whole: the tool's last time line may stop a frame short, and a
+        // run that completed must read 100%. A paused row keeps what it has done.
+        if (s == JobStatus::Failed || s == JobStatus::Completed)
+            done += duration;
+        else if ((s == JobStatus::Running || s == JobStatus::Paused || s == JobStatus::Pending) && child)
+            done += std::min(child->TimeSeconds(), duration);
     }
     return done;
+}
+
+EncodingDriver::RunCounts EncodingDriver::GetRunCounts() {
+    RunCounts counts;
+    for (int row = 0; row < m_list.GetRowCount(); ++row) {
+        MediaItem* item = m_list.GetItem(row);
+        if (!item || item->inRun != 1)
+            continue;
+        ++counts.total;
+        switch (item->Status()) {
+            case JobStatus::Completed: ++counts.completed; break;
+            case JobStatus::Failed: ++counts.failed; break;
+            case JobStatus::Aborted:
+            case JobStatus::AbortedSuspended: ++counts.stopped; break;
+            default: break;
+        }
+    }
+    return counts;
 }
 
 double EncodingDriver::GetRunTotalSeconds() {

@@ -120,6 +120,16 @@ public:
     // Evaluates CanEncodeChecked and applies it to the check boxes and the tab strip.
     bool UpdateCheckingEnabled();
 
+    // The rows of the current run by how they stand; the status bar words them.
+    struct RunCounts {
+        int total = 0;
+        int completed = 0;
+        int failed = 0;
+        int stopped = 0;
+        int Ended() const { return completed + failed + stopped; }
+    };
+    RunCounts GetRunCounts();
+
     bool AnyActive(bool includeWaiting);
     bool AnySelectedActive();
     double GetRunDoneSeconds();

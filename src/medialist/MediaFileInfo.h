@@ -33,6 +33,8 @@ struct DataStreamInfo {
 
 struct MediaFileInfo {
     std::string path;
+    // Why probing failed, in words a user can act on; empty when it succeeded.
+    std::string probeError;
     // The whole duration; all 0 when unknown.
     std::int32_t hours = 0;
     std::int32_t minutes = 0;

@@ -6,6 +6,8 @@
 #include <climits>
 #include <cstdio>
 #include <cstdlib>
+#include <sys/stat.h>
+#include <unistd.h>
 
 #include "medialist/CueSheet.h"
 
@@ -179,8 +181,34 @@ bool HeaderIsComplete(const AVFormatContext* ic, bool anyCodec) {
     return true;
 }
 
+namespace {
+
+// FFmpeg's "Invalid data found when processing input" says little to a user; the common cases
+// get words of their own.
+std::string OpenErrorText(const std::string& path, int error) {
+    struct stat st {};
+    if (::stat(path.c_str(), &st) != 0) {
+        return "no such file: " + path;
+    }
+    if (S_ISDIR(st.st_mode)) {
+        return "is a folder: " + path;
+    }
+    if (::access(path.c_str(), R_OK) != 0) {
+        return "cannot be read (no permission): " + path;
+    }
+    if (error == AVERROR_INVALIDDATA || error == AVERROR(EINVAL)) {
+        return "not a media file that can be read: " + path;
+    }
+    char text[AV_ERROR_MAX_STRING_SIZE] = {};
+    av_strerror(error, text, sizeof text);
+    return std::string(text) + ": " + path;
+}
+
+}  // namespace
+
 int ProbeFile(const std::string& path, MediaFileInfo& info) {
     info.path = path;
+    info.probeError.clear();
     info.hours = info.minutes = info.seconds = info.microseconds = 0;
     info.videoStreams.clear();
     info.audioStreams.clear();
@@ -193,14 +221,16 @@ int ProbeFile(const std::string& path, MediaFileInfo& info) {
         std::string error;
         if (!ResolveCueTrack(cue->sheet, cue->track, span, error)) {
             info.bitRate = 0;
+            info.probeError = error;
             return 0;
         }
         mediaPath = span.audioPath;
     }
 
     AVFormatContext* ic = nullptr;
-    if (avformat_open_input(&ic, mediaPath.c_str(), nullptr, nullptr) < 0) {
+    if (const int opened = avformat_open_input(&ic, mediaPath.c_str(), nullptr, nullptr); opened < 0) {
         info.bitRate = 0;
+        info.probeError = OpenErrorText(mediaPath, opened);
         return 0;
     }
     // Probing many files must stay cheap: the headers say almost everything, a short look at

@@ -78,11 +78,7 @@ void PlayEndOfRunSound() {
     if (config.GetInt("playsound") == 0) {
         return;
     }
-    std::string path = config.GetString("last_wavopenpath");
-    if (path.empty()) {
-        path = config.GetBaseDirectory() + "/wav/hint1.wav";
-    }
-    PlaySoundAsync(path);
+    PlaySoundAsync(config.GetString("last_wavopenpath"));
 }
 
 void RunAfterRunAction(int action, wxWindow* mainWindow) {

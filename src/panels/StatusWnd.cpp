@@ -22,6 +22,7 @@ namespace {
 
 constexpr std::uint32_t kMinuteText = 243;
 constexpr std::uint32_t kBadWorkMode = 0xC002;
+constexpr std::uint32_t kLogButtonTipId = 0xC183;
 
 // The audio disc's scale in minutes: 75 nearly full, 80 full, 90 the end of the gauge.
 constexpr long long kAudioNear = 75;
@@ -72,6 +73,7 @@ CStatusWnd::CStatusWnd(wxWindow* parent)
     m_bar->Show();
     m_logWnd = new CLogWnd(this);
     m_logButton->SetTextShown(false);
+    TranslateToolTips();
     Bind(
         wxEVT_BUTTON, [this](wxCommandEvent&) { ShowLog(); }, kLogButtonId);
     Bind(
@@ -151,11 +153,12 @@ void CStatusWnd::OnStatusTimer() {
     }
     switch (hub->WorkMode()) {
         case 0:
+            // Between runs the text keeps the last run's tally or the selected row's reason.
             if (!hub->IsConvertRunActive()) {
                 m_bar->SetPosition(0);
-                m_bar->SetText(wxEmptyString);
             } else {
                 m_bar->SetPosition(Percent(hub->RunDoneSeconds(), hub->RunTotalSeconds()));
+                m_bar->SetText(wxString::FromUTF8(hub->RunProgressText()));
             }
             break;
         case 1:
@@ -203,7 +206,12 @@ void CStatusWnd::AppendOnUi(const std::string& text, LogLineKind kind) {
     }
 }
 
+void CStatusWnd::TranslateToolTips() {
+    m_logButton->SetToolTip(wxString::FromUTF8(g_Language.GetString(kLogButtonTipId)));
+}
+
 void CStatusWnd::OnLanguageChanged() {
+    TranslateToolTips();
     TranslateWindow(*this, kDialogId);
     m_bar->SetUnitText(wxString::FromUTF8(g_Language.GetString(kMinuteText)));
     m_bar->Refresh(false);

@@ -64,6 +64,7 @@ public:
 
 private:
     void AppendOnUi(const std::string& text, LogLineKind kind);
+    void TranslateToolTips();
     void SetAudioDiscScale();
 
     CapacityBar* m_bar;

@@ -136,7 +136,7 @@ std::string MusicDirectory() {
     return music.empty() ? HomeDirectory() + "/Music" : music;
 }
 
-bool EnsureDirectory(const std::string& path) {
+bool EnsureDirectory(const std::string& path, unsigned mode) {
     if (path.empty()) {
         return false;
     }
@@ -145,10 +145,10 @@ bool EnsureDirectory(const std::string& path) {
         return S_ISDIR(st.st_mode);
     }
     std::string parent = ParentOf(path);
-    if (parent != path && !EnsureDirectory(parent)) {
+    if (parent != path && !EnsureDirectory(parent, mode)) {
         return false;
     }
-    return ::mkdir(path.c_str(), 0700) == 0 || errno == EEXIST;
+    return ::mkdir(path.c_str(), static_cast<mode_t>(mode)) == 0 || errno == EEXIST;
 }
 
 }  // namespace ac::platform

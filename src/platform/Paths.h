@@ -31,6 +31,8 @@ std::string MusicDirectory();
 std::string FindConversionTool();
 
 // Creates a directory and its parents (mode 0700 for new ones under the user's home).
-bool EnsureDirectory(const std::string& path);
+// `mode` before the umask: 0700 for the program's own folders, 0777 for the user's (output
+// folders), which must look like any other folder the user makes.
+bool EnsureDirectory(const std::string& path, unsigned mode = 0700);
 
 }  // namespace ac::platform

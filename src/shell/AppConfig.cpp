@@ -156,4 +156,25 @@ AppConfig& GetAppConfig() {
     return config;
 }
 
+void ReadStartupKeys(AppConfig& config) {
+    for (const char* name : {"max_processes", "max_running_processes", "output_file_overwrite",
+                             "afterconvert", "playsound", "last_wavopenpath", "slowdown", "idle",
+                             "OutputDir", "scheme", "allscheme", "illegal", "illegalreplace",
+                             "spacereplace", "replace", "alsoconverter"}) {
+        const ConfigKey* key = FindConfigKey(name);
+        if (key != nullptr && key->type == ConfigType::Int) {
+            config.GetInt(name);
+            continue;
+        }
+        if (!config.GetString(name).empty()) {
+            continue;
+        }
+        if (std::strcmp(name, "last_wavopenpath") == 0) {
+            config.SetString(name, (config.GetBaseDirectory() + "/wav/hint1.wav").c_str());
+        } else if (std::strcmp(name, "allscheme") == 0) {
+            config.SetString(name, AppConfig::DefaultString(name).c_str());
+        }
+    }
+}
+
 }  // namespace ac

@@ -83,4 +83,9 @@ private:
 // The program's one configuration object, made at the first call.
 AppConfig& GetAppConfig();
 
+// The keys the main window reads when it is made, in its order, each with its default, so that
+// the first start writes them all. An empty `last_wavopenpath` becomes the program's own sound
+// and an empty `allscheme` the default patterns (an empty scheme would name outputs ".mp3").
+void ReadStartupKeys(AppConfig& config);
+
 }  // namespace ac

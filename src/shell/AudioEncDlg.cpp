@@ -87,6 +87,7 @@ CAudioEncDlg::CAudioEncDlg()
                           GetAppConfig().SetString(key, value.c_str());
                       });
     AppConfig& config = GetAppConfig();
+    ReadStartupKeys(config);
     m_afterConvert = config.GetInt("afterconvert");
     Bind(wxEVT_MENU, &CAudioEncDlg::OnCommand, this);
     Bind(wxEVT_BUTTON, [this](wxCommandEvent& event) {

@@ -54,6 +54,7 @@ public:
     bool IsCommandEnabled(int commandId) override;
     void ShowContextMenu(wxWindow* owner, int menuId) override;
     void OnListSelectionChanged(int row) override;
+    void ShowRowReason(MediaItem& item);
     void SetStatusText(const std::string& text) override;
     void SetBitRateAllowed(bool allowed) override;
     void ShowFileInfo(MediaItem* item) override;
@@ -68,6 +69,7 @@ public:
     bool IsConvertRunActive() override;
     double RunDoneSeconds() override;
     double RunTotalSeconds() override;
+    std::string RunProgressText() override;
 
     // One line per fact, for the window tests' hook.
     std::string DescribeState() const;

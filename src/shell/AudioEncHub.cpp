@@ -82,11 +82,29 @@ void CAudioEncDlg::OnListSelectionChanged(int row) {
             }
             process->ReplayErrorLines();
         }
+        ShowRowReason(*selected);
     }
     if (g_MediaList->SelectedSets().size() < 2) {
         HandOverSelectedSets();
     } else if (!m_selectionTimer.IsRunning()) {
         m_selectionTimer.StartOnce(500);
+    }
+}
+
+// A failed or unreadable row says why where the user looks first: the status text, and the log
+// behind the button beside it.
+void CAudioEncDlg::ShowRowReason(MediaItem& item) {
+    if (g_StatusWnd == nullptr) {
+        return;
+    }
+    const JobStatus status = item.Status();
+    if (status == JobStatus::UnknownFile && !item.info.probeError.empty()) {
+        g_StatusWnd->Append(item.info.probeError + "\n", LogLineKind::Error);
+        g_StatusWnd->SetStatusText(item.info.probeError);
+    } else if (status == JobStatus::Failed) {
+        if (CEncodeProcess* process = item.process.load()) {
+            g_StatusWnd->SetStatusText(process->FailureReason());
+        }
     }
 }
 
@@ -253,6 +271,10 @@ double CAudioEncDlg::RunDoneSeconds() {
 
 double CAudioEncDlg::RunTotalSeconds() {
     return m_convert && m_convert->Driver() ? m_convert->Driver()->GetRunTotalSeconds() : 0.0;
+}
+
+std::string CAudioEncDlg::RunProgressText() {
+    return m_convert ? m_convert->RunProgressText() : std::string();
 }
 
 }  // namespace ac

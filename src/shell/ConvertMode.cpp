@@ -7,7 +7,9 @@
 #include "panels/ProgramDialogs.h"
 #include "platform/Paths.h"
 #include "platform/UiQueue.h"
+#include "panels/StatusWnd.h"
 #include "resources/Language.h"
+#include "resources/TextFormat.h"
 #include "shell/AppConfig.h"
 #include "shell/Check.h"
 #include "shell/MessageBoxes.h"
@@ -22,6 +24,9 @@ namespace {
 
 // Command ids of work mode 0: menu entries and the list panel's buttons.
 namespace id {
+constexpr std::uint32_t kRunProgressId = 0xC180;
+constexpr std::uint32_t kRunSummaryId = 0xC181;
+constexpr std::uint32_t kRunSummaryStoppedId = 0xC182;
 constexpr int kAdd = 32771;
 constexpr int kRemove = 32772;
 constexpr int kClear = 32773;
@@ -241,11 +246,42 @@ void CConvertMode::PostRunFinished() {
     std::weak_ptr<CConvertMode*> alive = m_alive;
     UiQueue::Post([alive] {
         if (std::shared_ptr<CConvertMode*> self = alive.lock()) {
-            if ((*self)->m_driver) {
-                (*self)->m_driver->OnRunFinished();
+            CConvertMode& mode = **self;
+            if (!mode.m_driver) {
+                return;
             }
+            if (g_StatusWnd != nullptr) {
+                g_StatusWnd->SetStatusText(mode.RunSummaryText());
+            }
+            // A run that ended by itself gives the tabs and the check boxes back, as Stop does.
+            mode.m_driver->UpdateCheckingEnabled();
+            mode.EnableTabStrip(true);
+            mode.m_driver->OnRunFinished();
         }
     });
+}
+
+std::string CConvertMode::RunProgressText() {
+    if (!m_driver) {
+        return {};
+    }
+    const EncodingDriver::RunCounts counts = m_driver->GetRunCounts();
+    return FormatText(g_Language.GetString(id::kRunProgressId),
+                      {std::to_string(counts.Ended()), std::to_string(counts.total)});
+}
+
+std::string CConvertMode::RunSummaryText() {
+    if (!m_driver) {
+        return {};
+    }
+    const EncodingDriver::RunCounts counts = m_driver->GetRunCounts();
+    if (counts.stopped > 0) {
+        return FormatText(g_Language.GetString(id::kRunSummaryStoppedId),
+                          {std::to_string(counts.completed), std::to_string(counts.failed),
+                           std::to_string(counts.stopped)});
+    }
+    return FormatText(g_Language.GetString(id::kRunSummaryId),
+                      {std::to_string(counts.completed), std::to_string(counts.failed)});
 }
 
 void CConvertMode::EnableTabStrip(bool enable) {

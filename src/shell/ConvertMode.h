@@ -42,6 +42,10 @@ public:
     void SetAfterConvertAction(int action);
 
     EncodingDriver* Driver() { return m_driver.get(); }
+    // "12 of 40 files converted", for the status bar while a run goes on.
+    std::string RunProgressText();
+    // "Finished: 38 completed, 2 failed", for the status bar when a run has ended.
+    std::string RunSummaryText();
 
     // IDriverHost
     bool AskYesNo(std::uint32_t textId) override;

@@ -77,6 +77,8 @@ public:
     virtual bool IsConvertRunActive() = 0;
     virtual double RunDoneSeconds() = 0;
     virtual double RunTotalSeconds() = 0;
+    // The bar's words while a conversion run goes on ("12 of 40 files converted").
+    virtual std::string RunProgressText() { return {}; }
 };
 
 // Set by the main dialog when it exists, cleared when it goes; the panels' tests set a fake.

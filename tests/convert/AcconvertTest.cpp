@@ -278,5 +278,34 @@ TEST_F(AcconvertTest, RealCueSheetsRefusedByTheStrictReaderConvertTrackByTrack) 
     EXPECT_NE(junk.err.find("line 2"), std::string::npos) << junk.err;
 }
 
+// The terminal tool behaves as terminal tools do: help on standard output, plain reasons for
+// inputs it cannot use, the library's own chatter kept off the terminal, 100% for a finished run.
+TEST_F(AcconvertTest, HelpReasonsAndTheFinalPercent) {
+    const test::ToolResult help = test::RunTool(kAcconvert, {"--help"}, 60);
+    EXPECT_EQ(help.exitCode, 0);
+    EXPECT_EQ(help.out.rfind("usage: acconvert", 0), 0u) << help.out;
+    EXPECT_NE(help.out.find("  mp3 "), std::string::npos) << "the profiles are listed";
+    EXPECT_EQ(help.err, "");
+
+    fs::create_directories(dir / "folder");
+    std::ofstream(dir / "junk.mp3") << "no MPEG stream here";
+    std::ofstream(dir / "file") << "x";
+    UseFakeTool("for last; do :; done\necho '|Time>>> 0.99'; printf mp3 > \"$last\"\n");
+    WriteWav(dir / "good.wav");
+    const test::ToolResult run = test::RunTool(
+        kAcconvert, Argv({dir / "good.wav", dir / "missing.wav", dir / "folder", dir / "junk.mp3"}), 60);
+    EXPECT_EQ(run.exitCode, 1);
+    EXPECT_NE(run.err.find(dir / "missing.wav" + ": no such file"), std::string::npos) << run.err;
+    EXPECT_NE(run.err.find(dir / "folder" + ": is a folder"), std::string::npos) << run.err;
+    EXPECT_NE(run.err.find("not a media file that can be read"), std::string::npos) << run.err;
+    EXPECT_EQ(run.err.find("Invalid data"), std::string::npos) << "FFmpeg's own log: " << run.err;
+    EXPECT_NE(run.out.find("done: " + dir / "good.wav"), std::string::npos) << run.out;
+    EXPECT_NE(run.out.find("(all 100%)"), std::string::npos) << run.out;
+
+    const test::ToolResult notFolder = test::RunTool(kAcconvert, {"--out", dir / "file", dir / "good.wav"}, 60);
+    EXPECT_EQ(notFolder.exitCode, 2);
+    EXPECT_NE(notFolder.err.find("is not a folder"), std::string::npos) << notFolder.err;
+}
+
 }  // namespace
 }  // namespace ac

@@ -38,6 +38,8 @@ public:
     void RememberProfileIndex(int, int) override {}
     bool IsConvertRunActive() override { return running; }
     double RunDoneSeconds() override { return done; }
+    std::string RunProgressText() override { return progressText; }
+    std::string progressText;
     double RunTotalSeconds() override { return total; }
 
     int mode = 0;
@@ -131,6 +133,11 @@ TEST_F(StatusWndTest, LogTextStaysWhenTheLogWindowIsClosedAndOpenedAgain) {
     m_panel->Append("first\n", LogLineKind::Warning);
     ASSERT_TRUE(test::PumpUntil([&] { return !control->IsEmpty(); }));
 
+    // The button has no words of its own; its tip says what it opens, in the language.
+    wxWindow* button = m_panel->FindWindow(CStatusWnd::kLogButtonId);
+    ASSERT_NE(button, nullptr);
+    EXPECT_EQ(button->GetToolTipText(), "Errors and warnings of the selected file");
+
     wxCommandEvent click(wxEVT_BUTTON, CStatusWnd::kLogButtonId);
     m_panel->ProcessWindowEvent(click);
     CLogWnd* window = m_panel->LogWindow();
@@ -166,10 +173,11 @@ TEST_F(StatusWndTest, TimerFollowsTheConvertRunOfTheHub) {
     hub.running = true;
     hub.done = 30;
     hub.total = 120;
-    bar->SetText("Encoding");
+    hub.progressText = "3 of 40 files converted";
+    bar->SetText("Done.");
     m_panel->OnStatusTimer();
     EXPECT_EQ(bar->Position(), 25);
-    EXPECT_EQ(bar->Text(), "Encoding") << "the text stays as the tool's last line set it";
+    EXPECT_EQ(bar->Text(), "3 of 40 files converted") << "a run's words, not a tool's last line";
     test::Screenshot(m_frame, "status_panel_convert");
 
     hub.total = 0.05;
@@ -178,9 +186,10 @@ TEST_F(StatusWndTest, TimerFollowsTheConvertRunOfTheHub) {
 
     hub.running = false;
     hub.total = 120;
+    bar->SetText("Finished: 38 completed, 2 failed");
     m_panel->OnStatusTimer();
     EXPECT_EQ(bar->Position(), 0);
-    EXPECT_EQ(bar->Text(), "");
+    EXPECT_EQ(bar->Text(), "Finished: 38 completed, 2 failed") << "the tally stays after the run";
 
     hub.mode = 2;
     bar->SetPosition(77);

@@ -81,6 +81,26 @@ TEST_F(AppConfigTest, TableDefaultsServeTheShortReads) {
     EXPECT_EQ(config.GetString("OutputCDDir"), dir.Path() + "/Music");
 }
 
+// A first start writes every key the main window reads; an empty scheme list (which named
+// outputs ".mp3", "-1.mp3") and an empty sound path are put back.
+TEST_F(AppConfigTest, StartupWritesEveryKeyOfTheMainWindowAndMendsTwoEmptyOnes) {
+    ASSERT_TRUE(config.SetString("allscheme", ""));
+    ASSERT_TRUE(config.SetString("last_wavopenpath", ""));
+    ReadStartupKeys(config);
+    for (const char* name : {"max_processes", "max_running_processes", "output_file_overwrite",
+                             "afterconvert", "playsound", "last_wavopenpath", "slowdown", "idle",
+                             "OutputDir", "scheme", "allscheme", "illegal", "illegalreplace",
+                             "spacereplace", "replace", "alsoconverter"}) {
+        EXPECT_TRUE(raw.Read(settingsKey, name)) << name;
+    }
+    EXPECT_EQ(raw.Read(settingsKey, "allscheme")->text, "E,AE,AEB,ABE,AHE,AEH");
+    EXPECT_TRUE(raw.Read(settingsKey, "last_wavopenpath")->text.ends_with("/wav/hint1.wav"));
+    // A value the user chose stays.
+    ASSERT_TRUE(config.SetString("allscheme", "AEH"));
+    ReadStartupKeys(config);
+    EXPECT_EQ(raw.Read(settingsKey, "allscheme")->text, "AEH");
+}
+
 TEST(ConfigKeyTableTest, NamesAreUniqueAndServerEntriesResolve) {
     std::set<std::string> names;
     for (const ConfigKey& key : ConfigKeys()) {

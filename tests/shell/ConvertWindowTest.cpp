@@ -199,6 +199,41 @@ TEST_F(ConvertWindowTest, RunningJobsNeverShareANameAndStopLeavesNothingBehind) 
     EXPECT_EQ(left, (std::vector<std::string>{"a-1.mp3", "a-2.mp3", "a.mp3"}));
 }
 
+// A run with a failing row and an unreadable one: the status text tallies the run, gives the
+// tabs back, and a selected failed or unknown row says why, in the text and in its log.
+TEST_F(ConvertWindowTest, FailedRowsSayWhyAndTheEndOfARunGivesTheTabsBack) {
+    const std::string good = Wav("good.wav", 1.0, 50);
+    const std::string cut = Wav("cut short.wav", 2.0, 51);
+    std::filesystem::resize_file(cut, std::filesystem::file_size(cut) / 2);
+    const std::string junk = m_home / "in/junk.mp3";
+    std::ofstream(junk) << "no MPEG stream here";
+    Program program(m_home);
+    program.WaitShown();
+    program.Send("outdir " + (m_home / "out"));
+    for (const std::string& file : {good, cut, junk}) {
+        program.Send("add " + file);
+    }
+    program.WaitFor([](const State& s) { return Rows(s).size() == 3; });
+    program.Send("command 32776");
+    State state = program.WaitFor([](const State& s) {
+        return Status(s, 0) == kCompleted && Status(s, 1) == -1 &&
+               Field(s, "statustext").rfind("Finished", 0) == 0;
+    }, 60s);
+    EXPECT_EQ(Field(state, "statustext"), "Finished: 1 completed, 1 failed");
+    EXPECT_NE(Field(state, "tabs").find("Rip+"), std::string::npos) << Field(state, "tabs");
+    EXPECT_NE(Field(state, "tabs").find("Burn+"), std::string::npos) << Field(state, "tabs");
+
+    program.Send("select 1");
+    state = program.WaitFor([](const State& s) { return Field(s, "statustext").find("Finished") == std::string::npos; });
+    EXPECT_NE(Field(state, "statustext"), "");
+    EXPECT_NE(Field(state, "log").find(Field(state, "statustext")), std::string::npos) << Field(state, "log");
+
+    program.Send("select 2");
+    state = program.WaitFor([](const State& s) { return Field(s, "statustext").find("junk.mp3") != std::string::npos; });
+    EXPECT_EQ(Field(state, "statustext"), "not a media file that can be read: " + junk);
+    EXPECT_NE(Field(state, "log").find("not a media file"), std::string::npos);
+}
+
 TEST_F(ConvertWindowTest, UnreadableFilesAndCueSheetsBecomeRows) {
     const std::string junk = m_home / "in/not audio.mp3";
     std::ofstream(junk) << "this is no MPEG stream";

@@ -108,9 +108,15 @@ void ConsoleRun::ReportEnded(int row, JobStatus status, int overall) {
         std::fprintf(m_out, " -> %s", item->outputPath.c_str());
     std::fprintf(m_out, " (all %d%%)\n", overall);
     if (status == JobStatus::Failed) {
-        if (CEncodeProcess* child = item->process.load())
-            for (const auto& line : child->ErrorLines())
+        if (CEncodeProcess* child = item->process.load()) {
+            const std::vector<std::string> lines = child->ErrorLines();
+            for (const auto& line : lines)
                 std::fprintf(stderr, "    %s\n", line.c_str());
+            if (lines.empty())
+                std::fprintf(stderr, "    %s\n", child->FailureReason().c_str());
+        }
+    } else if (status == JobStatus::UnknownFile && !item->info.probeError.empty()) {
+        std::fprintf(stderr, "    %s\n", item->info.probeError.c_str());
     }
 }
 

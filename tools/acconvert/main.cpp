@@ -11,6 +11,7 @@
 #include "convert/CommandLine.h"
 #include "convert/OutputNaming.h"
 #include "convert/RowParameters.h"
+#include "medialist/CueSheet.h"
 #include "medialist/MediaListRules.h"
 #include "medialist/MediaProbe.h"
 #include "platform/Paths.h"
@@ -31,6 +32,10 @@
 #include <vector>
 #include <unistd.h>
 
+extern "C" {
+#include <libavutil/log.h>
+}
+
 namespace {
 
 namespace fs = std::filesystem;
@@ -47,10 +52,39 @@ struct Options {
     std::string outputDirectory;
     int jobs = 0;
     std::vector<std::string> files;
+    bool help = false;
 };
 
-void Usage() {
-    std::fputs("usage: acconvert [--profile NAME|PATH] [--out DIR] [--jobs N] FILE...\n", stderr);
+constexpr const char* kUsage = "usage: acconvert [--profile NAME|PATH] [--out DIR] [--jobs N] FILE...\n";
+
+void Usage() { std::fputs(kUsage, stderr); }
+
+// The profiles a user can name: system profiles first, then the user's own.
+void PrintProfiles(const std::string& base) {
+    for (const char* folder : {"\\profile\\", "\\profile\\user\\"}) {
+        ImPackageFinder finder;
+        for (bool more = finder.FindFile(base + folder + "*.pf"); more; more = finder.FindNextFile()) {
+            std::string file = finder.GetFileName();
+            if (file.size() > 3)
+                file.resize(file.size() - 3);
+            Profile profile(finder.GetFilePath());
+            std::printf("  %-12s %s\n", file.c_str(), profile.IsLoaded() ? profile.GetName().c_str() : "");
+        }
+    }
+}
+
+void Help(const std::string& base) {
+    std::fputs(kUsage, stdout);
+    std::puts("\nConverts audio and video files, and the tracks of cue sheets, into audio files with the\n"
+              "program's own profiles, naming rules and settings.\n\n"
+              "  --profile NAME|PATH  a profile by file name or shown name, or a .pf file (default mp3)\n"
+              "  --out DIR            the output folder (default: the program's destination folder)\n"
+              "  --jobs N             conversions running at once (default: the program's setting)\n"
+              "  --help               this text\n\n"
+              "Exit status: 0 when every file converted, 1 when some did not, 2 for a usage error,\n"
+              "130 when stopped (Ctrl-C); a stopped run leaves no partial file.\n\n"
+              "Profiles:");
+    PrintProfiles(base);
 }
 
 bool ParseArguments(int argc, char** argv, Options& options) {
@@ -68,7 +102,8 @@ bool ParseArguments(int argc, char** argv, Options& options) {
             else if ((options.jobs = std::atoi(text)) <= 0)
                 return false;
         } else if (word == "--help" || word == "-h") {
-            return false;
+            options.help = true;
+            return true;
         } else if (word == "--") {
             for (++i; i < argc; ++i)
                 options.files.emplace_back(argv[i]);
@@ -78,7 +113,32 @@ bool ParseArguments(int argc, char** argv, Options& options) {
             options.files.push_back(word);
         }
     }
-    return !options.files.empty();
+    return !options.files.empty() || options.help;
+}
+
+// A folder given as the output must be one, or not exist yet (it is created).
+bool CheckPaths(const Options& options) {
+    std::error_code error;
+    if (!options.outputDirectory.empty() && fs::exists(options.outputDirectory, error) &&
+        !fs::is_directory(options.outputDirectory, error)) {
+        std::fprintf(stderr, "acconvert: %s: is not a folder\n", options.outputDirectory.c_str());
+        return false;
+    }
+    return true;
+}
+
+// Says why an input cannot be converted at all, as other tools do, so it is not run.
+bool InputUsable(const std::string& file) {
+    std::error_code error;
+    if (!fs::exists(file, error) && !SplitCueTrackPath(file)) {
+        std::fprintf(stderr, "acconvert: %s: no such file\n", file.c_str());
+        return false;
+    }
+    if (fs::is_directory(file, error)) {
+        std::fprintf(stderr, "acconvert: %s: is a folder\n", file.c_str());
+        return false;
+    }
+    return true;
 }
 
 // Held through its base: the profile keeps its value lists in a type of its own.
@@ -186,8 +246,17 @@ int main(int argc, char** argv) {
         Usage();
         return 2;
     }
+    // Probing runs in this process: FFmpeg's own complaints would land between the progress
+    // lines. The reasons a file fails are printed in words of our own.
+    av_log_set_level(AV_LOG_QUIET);
     AppConfig& config = GetAppConfig();
     std::string base = config.GetBaseDirectory();
+    if (options.help) {
+        Help(base);
+        return 0;
+    }
+    if (!CheckPaths(options))
+        return 2;
     LoosePackage loose;
     std::unique_ptr<ParameterSet> profile = FindProfile(options.profile, base, loose);
     if (!profile) {
@@ -220,13 +289,19 @@ int main(int argc, char** argv) {
     std::signal(SIGPIPE, SIG_IGN);
 
     console::ConsoleRun run(outputDirectory, ::isatty(STDOUT_FILENO) == 1, stdout);
-    for (const auto& file : options.files)
-        AddSource(run, fs::absolute(file).lexically_normal().string(), *profile);
+    int unusable = 0;
+    for (const auto& file : options.files) {
+        if (InputUsable(file))
+            AddSource(run, fs::absolute(file).lexically_normal().string(), *profile);
+        else
+            ++unusable;
+    }
 
     OutputNamer namer = MakeRowNamer([naming] { return naming; });
     CommandBuilder builder = [](MediaItem& item) {
         return BuildConversionCommandText(item.sourcePath, item.outputPath, item.volume,
                                           *SetOf(item));
     };
-    return run.Run(driverConfig, namer, builder, g_stopRequested);
+    const int result = run.Run(driverConfig, namer, builder, g_stopRequested);
+    return result == 0 && unusable > 0 ? 1 : result;
 }

@@ -25,6 +25,8 @@ COutputPanelWnd* g_OutputPanel = nullptr;
 
 namespace {
 
+// Output folders are the user's: made as any folder the user makes (0777 less the umask).
+constexpr unsigned kUserFolderMode = 0777;
 constexpr int kCopiesMin = 1;
 constexpr int kCopiesMax = 100;
 
@@ -62,8 +64,8 @@ COutputPanelWnd::COutputPanelWnd(wxWindow* parent)
     m_spin->SetValue(copies);
     m_copies->ChangeValue(std::to_string(copies));
     // A folder that cannot be made stays unmade: the driver reports it when a job starts.
-    platform::EnsureDirectory(ReadFolderKey(config, "OutputDir"));
-    platform::EnsureDirectory(ReadFolderKey(config, "OutputCDDir"));
+    platform::EnsureDirectory(ReadFolderKey(config, "OutputDir"), kUserFolderMode);
+    platform::EnsureDirectory(ReadFolderKey(config, "OutputCDDir"), kUserFolderMode);
     m_rowHeight = m_directory->GetSize().y;
     ShowModeFolder();
     g_OutputPanel = this;
@@ -134,7 +136,7 @@ void COutputPanelWnd::CommitDirectory() {
     if (m_showType == 0 || m_showType == 1) {
         GetAppConfig().SetString(FolderKey(m_showType), text.c_str());
         if (!text.empty()) {
-            platform::EnsureDirectory(text);
+            platform::EnsureDirectory(text, kUserFolderMode);
         }
     }
 }
@@ -168,7 +170,7 @@ std::string COutputPanelWnd::FolderToOpen() const {
 void COutputPanelWnd::OpenFolder() {
     const std::string path = FolderToOpen();
     if (m_showType == 1) {
-        platform::EnsureDirectory(path);
+        platform::EnsureDirectory(path, kUserFolderMode);
     }
     if (!wxLaunchDefaultApplication(wxString::FromUTF8(path))) {
         ShowBox(this, FormatText(g_Language.GetString(0xC060), {path}), wxOK | wxICON_ERROR);
