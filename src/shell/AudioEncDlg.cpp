@@ -14,6 +14,7 @@
 #include "shell/ConvertMode.h"
 #include "shell/MenuTables.h"
 #include "shell/MessageBoxes.h"
+#include "shell/ProgramIcon.h"
 #include "convert/RowParameters.h"
 #include "skin/ShutDownDlg.h"
 #include "skin/ChooseSkinDlg.h"
@@ -23,9 +24,7 @@
 #include "skin/UiQueueWx.h"
 #include "skin/WxTranslate.h"
 
-#include <wx/dcmemory.h>
 #include <wx/filename.h>
-#include <wx/graphics.h>
 #include <wx/msgdlg.h>
 #include <wx/textctrl.h>
 #include <wx/taskbar.h>
@@ -48,30 +47,6 @@ constexpr int kPlayerHeight = 280;
 // afterconvert keeps 0 shut down, 1 standby, 2 hibernate, 3 exit, 4 none; the menu lists
 // No action, Shut Down, Hibernate, Standby, Kill me.
 constexpr int kAfterConvertOfCommand[5] = {4, 0, 2, 1, 3};
-
-class CTrayIcon : public wxTaskBarIcon {
-public:
-    explicit CTrayIcon(CAudioEncDlg* owner) : m_owner(owner) {
-        Bind(wxEVT_TASKBAR_LEFT_DCLICK, [this](wxTaskBarIconEvent&) {
-            wxCommandEvent open(wxEVT_MENU, cmd::kTrayOpen);
-            wxPostEvent(m_owner, open);
-        });
-        Bind(wxEVT_MENU, [this](wxCommandEvent& event) {
-            wxCommandEvent forward(wxEVT_MENU, event.GetId());
-            wxPostEvent(m_owner, forward);
-        });
-    }
-
-protected:
-    wxMenu* CreatePopupMenu() override {
-        std::unique_ptr<wxMenu> menu = BuildContextMenu(kTrayMenu);
-        TranslatePopupMenu(*menu, kTrayMenu);
-        return menu.release();
-    }
-
-private:
-    CAudioEncDlg* m_owner;
-};
 
 }  // namespace
 
@@ -129,34 +104,6 @@ CAudioEncDlg::~CAudioEncDlg() {
     }
 }
 
-wxBitmap CAudioEncDlg::MakeIcon(int size) const {
-    wxImage image(size, size);
-    image.InitAlpha();
-    for (int y = 0; y < size; ++y) {
-        for (int x = 0; x < size; ++x) {
-            image.SetAlpha(x, y, 0);
-        }
-    }
-    wxBitmap bitmap(image);
-    wxMemoryDC dc(bitmap);
-    std::unique_ptr<wxGraphicsContext> gc(wxGraphicsContext::Create(dc));
-    if (gc) {
-        const double s = size;
-        gc->SetBrush(gc->CreateLinearGradientBrush(0, 0, 0, s, wxColour(0x3B, 0x82, 0xF6),
-                                                   wxColour(0x1E, 0x40, 0xAF)));
-        gc->SetPen(*wxTRANSPARENT_PEN);
-        gc->DrawRoundedRectangle(0, 0, s, s, s * 0.22);
-        gc->SetBrush(*wxWHITE_BRUSH);
-        gc->DrawEllipse(s * 0.22, s * 0.58, s * 0.26, s * 0.2);
-        gc->DrawRectangle(s * 0.42, s * 0.2, s * 0.07, s * 0.48);
-        gc->DrawRectangle(s * 0.42, s * 0.2, s * 0.34, s * 0.08);
-        gc->DrawRectangle(s * 0.69, s * 0.2, s * 0.07, s * 0.42);
-        gc->DrawEllipse(s * 0.5, s * 0.52, s * 0.26, s * 0.2);
-    }
-    dc.SelectObject(wxNullBitmap);
-    return bitmap;
-}
-
 void CAudioEncDlg::OnInitDialog() {
     InitialPlacement();
     g_MainDlg = this;
@@ -169,7 +116,7 @@ void CAudioEncDlg::OnInitDialog() {
     wxIconBundle icons;
     for (int size : {16, 32, 48}) {
         wxIcon icon;
-        icon.CopyFromBitmap(MakeIcon(size));
+        icon.CopyFromBitmap(MakeProgramIcon(size));
         icons.AddIcon(icon);
     }
     SetIcons(icons);
@@ -179,7 +126,7 @@ void CAudioEncDlg::OnInitDialog() {
 
     g_Skin.ChooseStartSkin(GetAppConfig().GetString("last_skin"));
     if (ImCaptionBar* caption = GetCaptionBar()) {
-        caption->SetSmallIcon(MakeIcon(16));
+        caption->SetSmallIcon(MakeProgramIcon(16));
     }
     int mode = GetAppConfig().GetInt("last_run_function");
     if (mode < 0 || mode > 2) {
@@ -404,10 +351,10 @@ void CAudioEncDlg::OnTimer(wxTimerEvent& event) {
 
 void CAudioEncDlg::ToTray() {
     if (!m_tray) {
-        m_tray = std::make_unique<CTrayIcon>(this);
+        m_tray = MakeTrayIcon(this);
     }
     wxIcon icon;
-    icon.CopyFromBitmap(MakeIcon(32));
+    icon.CopyFromBitmap(MakeProgramIcon(32));
     m_tray->SetIcon(icon, m_check->Tab(GetWorkMode())->GetLabel());
     m_bInTray = true;
     Hide();
@@ -511,245 +458,6 @@ void CAudioEncDlg::OnCommand(wxCommandEvent& event) {
             // Commands of the list panels arrive here once those panels exist.
             event.Skip();
             return;
-    }
-}
-
-std::string CAudioEncDlg::DescribeState() const {
-    std::ostringstream out;
-    const wxRect r = GetRect();
-    out << "title=" << GetTitle().utf8_string() << "\n";
-    out << "rect=" << r.x << "," << r.y << "," << r.width << "," << r.height << "\n";
-    out << "mode=" << GetWorkMode() << "\n";
-    static const char* const kNames[PanelCount] = {"MediaList",   "CDCreatorPanel", "OutputPanel",
-                                                   "PlayerPanel", "CDRip",          "SideBar",
-                                                   "StatusBar"};
-    out << "visible=";
-    for (int i = 0; i < PanelCount; ++i) {
-        if (m_panels[std::size_t(i)] != nullptr && m_panels[std::size_t(i)]->IsShown()) {
-            out << kNames[i] << ";";
-        }
-    }
-    out << "\n";
-    if (ImMenuBar* bar = const_cast<CAudioEncDlg*>(this)->GetSkinMenuBar(false);
-        bar != nullptr && bar->GetMenu() != nullptr) {
-        ImMenu* menu = bar->GetMenu();
-        out << "menu=" << menu->resourceId << "\n";
-        out << "captions=";
-        for (const auto& [caption, popup] : menu->tops) {
-            out << caption.utf8_string() << "|";
-        }
-        out << "\n";
-        if (wxMenuItem* exit = menu->tops[0].second->FindChildItem(cmd::kExit)) {
-            out << "exit=" << exit->GetItemLabel().utf8_string() << "\n";
-        }
-    }
-    out << "tabs=";
-    for (int i = 0; i < 3; ++i) {
-        out << m_check->Tab(i)->GetLabel().utf8_string()
-            << (m_check->Tab(i)->IsEnabled() ? "+" : "-") << "|";
-    }
-    out << "\n";
-    out << "skin=" << g_Skin.GetSkinName() << "\n";
-    out << "language=" << g_Language.GetLanguageName() << "\n";
-    out << "corners=" << (HasFlag(wxFRAME_SHAPED) ? 1 : 0) << "\n";
-    DescribePanels(out);
-    out << "firstpaint_ms=" << m_firstPaintMs << "\n";
-    out << "resize_ms=" << m_lastBench << "\n";
-    return out.str();
-}
-
-void CAudioEncDlg::DescribePanels(std::ostream& out) const {
-    if (g_MediaList != nullptr) {
-        // Tab-separated: a cue track's type and source hold a '|' of their own.
-        XListCtrl* list = g_MediaList->List();
-        const std::vector<MediaItem*> items = g_MediaList->Items();
-        for (int row = 0; row < list->GetItemCount() && row < static_cast<int>(items.size());
-             ++row) {
-            MediaItem& item = *items[std::size_t(row)];
-            out << "row" << row << "=";
-            for (int column = 1; column <= 5; ++column) {
-                out << list->GetItemText(row, column) << "\t";
-            }
-            out << (list->GetCheckbox(row, 0) == 1 ? 1 : 0) << "\t"
-                << (list->IsSelected(row) ? 1 : 0) << "\t" << item.sourcePath << "\t"
-                << static_cast<int>(item.Status()) << "\n";
-            if (ParameterSet* set = SetOf(item)) {
-                out << "set" << row << "=";
-                for (const char* key : {"ab", "ar", "ac", "vol_factor", "acodec"}) {
-                    out << key << ":" << set->GetValue(key) << ";";
-                }
-                out << "volume:" << item.volume.load() << "\n";
-            }
-        }
-    }
-    if (g_OutputPanel != nullptr) {
-        out << "outdir=" << g_OutputPanel->GetOutputDirectory() << "\n";
-    }
-    if (g_SideBar != nullptr) {
-        out << g_SideBar->DescribeState() << "\n";
-    }
-    if (g_StatusWnd != nullptr) {
-        out << g_StatusWnd->DescribeState() << "\n";
-    }
-    std::string boxes;
-    for (std::string text : ShownBoxes()) {
-        std::replace(text.begin(), text.end(), '\n', ' ');
-        boxes += text + "|";
-    }
-    out << "boxes=" << boxes << "\n";
-    bool countdown = false;
-    for (wxWindow* window : wxTopLevelWindows) {
-        if (dynamic_cast<ImShutDownDlg*>(window) != nullptr && window->IsShown()) {
-            countdown = true;
-        }
-    }
-    out << "countdown=" << (countdown ? 1 : 0) << "\n";
-    out << "running=" << (m_convert && m_convert->Driver() ? m_convert->Driver()->ProcessCount() : 0)
-        << "\n";
-}
-
-void CAudioEncDlg::RunScriptCommand(const std::string& line) {
-    std::istringstream in(line);
-    std::string verb;
-    in >> verb;
-    std::string rest;
-    std::getline(in >> std::ws, rest);
-    in.clear();
-    in.str(rest);
-    if (verb == "add" && g_MediaList != nullptr) {
-        g_MediaList->AddFile(rest, -1);
-    } else if (verb == "addfolder" && g_MediaList != nullptr) {
-        g_MediaList->AddFolder(rest, -1);
-    } else if (verb == "outdir" && g_OutputPanel != nullptr) {
-        g_OutputPanel->SetDirectoryText(rest);
-        g_OutputPanel->CommitDirectory();
-    } else if (verb == "answer") {
-        QueueBoxAnswer(rest == "no" ? wxNO : wxYES);
-    } else if (verb == "dialog") {
-        // Presses OK or Cancel of the modal dialog in front; the program's own dialogs keep
-        // the resource ids 1 and 2 for them.
-        const bool ok = rest == "ok";
-        for (wxWindow* window : wxTopLevelWindows) {
-            auto* dialog = dynamic_cast<wxDialog*>(window);
-            if (dialog == nullptr || !dialog->IsModal()) {
-                continue;
-            }
-            const int okIds[] = {1, wxID_OK};
-            const int cancelIds[] = {2, wxID_CANCEL};
-            for (int id : ok ? okIds : cancelIds) {
-                if (wxWindow* button = dialog->FindWindow(id)) {
-                    wxCommandEvent press(wxEVT_BUTTON, id);
-                    press.SetEventObject(button);
-                    button->GetEventHandler()->ProcessEvent(press);
-                    return;
-                }
-            }
-            dialog->EndModal(ok ? wxID_OK : wxID_CANCEL);
-            return;
-        }
-    } else if (verb == "select" && g_MediaList != nullptr) {
-        int row = -1;
-        in >> row;
-        g_MediaList->SelectOnly(row);
-    } else if (verb == "grid" && g_SideBar != nullptr) {
-        // An edit in the advanced grid, committed as the grid's own editor commits it.
-        std::string key;
-        std::string value;
-        in >> key;
-        std::getline(in >> std::ws, value);
-        ParameterGrid* grid = g_SideBar->Grid();
-        const PropertyIterator item = grid->FindById(FindParameterIndex(key));
-        if (item.IsValid()) {
-            grid->Select(item);
-            grid->CommitEditText(value);
-        }
-    } else if (verb == "dialogtext") {
-        // Types into the first edit field of the modal dialog in front.
-        for (wxWindow* window : wxTopLevelWindows) {
-            auto* dialog = dynamic_cast<wxDialog*>(window);
-            if (dialog == nullptr || !dialog->IsModal()) {
-                continue;
-            }
-            for (wxWindow* child : dialog->GetChildren()) {
-                if (auto* edit = dynamic_cast<wxTextCtrl*>(child)) {
-                    edit->SetValue(wxString::FromUTF8(rest));
-                    break;
-                }
-            }
-            break;
-        }
-    } else if (verb == "saveas" && g_SideBar != nullptr) {
-        g_SideBar->SaveProfile(true);
-    } else if (verb == "rename" && g_SideBar != nullptr) {
-        g_SideBar->RenameProfile();
-    } else if (verb == "delete" && g_SideBar != nullptr) {
-        g_SideBar->DeleteProfile();
-    } else if (verb == "profile" && g_SideBar != nullptr) {
-        int index = 0;
-        in >> index;
-        g_SideBar->SelectIndex(index, true);
-    } else if (verb == "tab") {
-        int mode = 0;
-        in >> mode;
-        SwitchMode(mode);
-    } else if (verb == "command") {
-        int id = 0;
-        in >> id;
-        wxCommandEvent command(wxEVT_MENU, id);
-        OnCommand(command);
-    } else if (verb == "skin") {
-        std::string name;
-        in >> name;
-        for (const auto& [id, dir] : m_skinCommands) {
-            if (SkinNameOf(dir) == name) {
-                // The command rebuilds the menu and this map: leave the loop first.
-                wxCommandEvent command(wxEVT_MENU, id);
-                OnCommand(command);
-                break;
-            }
-        }
-    } else if (verb == "language") {
-        std::string name;
-        in >> name;
-        for (const auto& [id, language] : m_languageCommands) {
-            if (language == name) {
-                wxCommandEvent command(wxEVT_MENU, id);
-                OnCommand(command);
-                break;
-            }
-        }
-    } else if (verb == "move") {
-        int x = 0, y = 0, w = 0, h = 0;
-        in >> x >> y >> w >> h;
-        SetSize(x, y, w, h);
-    } else if (verb == "menu") {
-        int index = 0;
-        std::string key;
-        in >> index >> key;
-        if (ImMenuBar* bar = GetSkinMenuBar(false)) {
-            bar->OpenByIndex(index);
-            if (!key.empty() && bar->Popup() != nullptr) {
-                // "down" and "right" walk the open popup as the keyboard does.
-                for (char c : key) {
-                    bar->Popup()->OnKey(c == 'd' ? WXK_DOWN : c == 'r' ? WXK_RIGHT : WXK_UP);
-                }
-            }
-        }
-    } else if (verb == "benchresize") {
-        // Repaint time after a resize, for bench/skin_bench.sh: each step resizes and paints.
-        int steps = 50;
-        in >> steps;
-        const wxRect start = GetRect();
-        const wxLongLong begin = wxGetUTCTimeUSec();
-        for (int i = 0; i < steps; ++i) {
-            SetSize(start.width + (i % 10) * 12, start.height + (i % 7) * 9);
-            Update();
-        }
-        const double perStep = (wxGetUTCTimeUSec() - begin).ToDouble() / 1000.0 / steps;
-        SetSize(start);
-        m_lastBench = perStep;
-    } else if (verb == "close") {
-        Close();
     }
 }
 

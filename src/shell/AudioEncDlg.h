@@ -71,12 +71,9 @@ public:
     double RunTotalSeconds() override;
     std::string RunProgressText() override;
 
-    // One line per fact, for the window tests' hook.
-    std::string DescribeState() const;
-    void RunScriptCommand(const std::string& line);
-    void DescribePanels(std::ostream& out) const;
-
 private:
+    friend class CTestHook;
+
     enum Panel { MediaList, Creator, Output, Player, Rip, SideBar, Status, PanelCount };
 
     void CreatePanels();
@@ -95,7 +92,6 @@ private:
     void ToTray();
     void FromTray();
     bool RunStopLogic();
-    wxBitmap MakeIcon(int size) const;
 
     CCheck* m_check = nullptr;
     std::array<ImSkinPanel*, PanelCount> m_panels{};

@@ -2,9 +2,31 @@
 
 #include "shell/AudioEncDlg.h"
 
+#include "convert/RowParameters.h"
+#include "medialist/ui/MediaListWnd.h"
+#include "medialist/ui/OutputPanelWnd.h"
+#include "panels/StatusWnd.h"
+#include "profile/ParameterSet.h"
+#include "profile/ui/ParameterGrid.h"
+#include "profile/ui/SideBarWnd.h"
+#include "resources/Language.h"
+#include "shell/Check.h"
+#include "shell/ConvertMode.h"
+#include "shell/MenuTables.h"
+#include "shell/MessageBoxes.h"
+#include "skin/ChooseSkinDlg.h"
+#include "skin/ListCtrl.h"
+#include "skin/ShutDownDlg.h"
+#include "skin/SkinManager.h"
+#include "skin/SkinMenu.h"
+
+#include <wx/dialog.h>
+#include <wx/textctrl.h>
+#include <wx/time.h>
 #include <wx/timer.h>
 #include <wx/weakref.h>
 
+#include <algorithm>
 #include <cstdio>
 #include <cstdlib>
 #include <fstream>
@@ -44,7 +66,7 @@ public:
                 wxWeakRef<CAudioEncDlg> dialog = m_dialog;
                 m_dialog->CallAfter([dialog, command] {
                     if (dialog) {
-                        dialog->RunScriptCommand(command);
+                        CTestHook::RunScriptCommand(*dialog, command);
                     }
                 });
             }
@@ -52,7 +74,7 @@ public:
         if (!m_dialog) {
             return;
         }
-        const std::string state = m_dialog->DescribeState();
+        const std::string state = CTestHook::DescribeState(*m_dialog);
         if (state != m_lastState) {
             m_lastState = state;
             std::ofstream out(m_dir + "/state.tmp", std::ios::trunc);
@@ -69,6 +91,246 @@ private:
 };
 
 }  // namespace
+
+std::string CTestHook::DescribeState(const CAudioEncDlg& dlg) {
+    std::ostringstream out;
+    const wxRect r = dlg.GetRect();
+    out << "title=" << dlg.GetTitle().utf8_string() << "\n";
+    out << "rect=" << r.x << "," << r.y << "," << r.width << "," << r.height << "\n";
+    out << "mode=" << dlg.GetWorkMode() << "\n";
+    static const char* const kNames[CAudioEncDlg::PanelCount] = {"MediaList",   "CDCreatorPanel", "OutputPanel",
+                                                   "PlayerPanel", "CDRip",          "SideBar",
+                                                   "StatusBar"};
+    out << "visible=";
+    for (int i = 0; i < CAudioEncDlg::PanelCount; ++i) {
+        if (dlg.m_panels[std::size_t(i)] != nullptr && dlg.m_panels[std::size_t(i)]->IsShown()) {
+            out << kNames[i] << ";";
+        }
+    }
+    out << "\n";
+    if (ImMenuBar* bar = const_cast<CAudioEncDlg&>(dlg).GetSkinMenuBar(false);
+        bar != nullptr && bar->GetMenu() != nullptr) {
+        ImMenu* menu = bar->GetMenu();
+        out << "menu=" << menu->resourceId << "\n";
+        out << "captions=";
+        for (const auto& [caption, popup] : menu->tops) {
+            out << caption.utf8_string() << "|";
+        }
+        out << "\n";
+        if (wxMenuItem* exit = menu->tops[0].second->FindChildItem(cmd::kExit)) {
+            out << "exit=" << exit->GetItemLabel().utf8_string() << "\n";
+        }
+    }
+    out << "tabs=";
+    for (int i = 0; i < 3; ++i) {
+        out << dlg.m_check->Tab(i)->GetLabel().utf8_string()
+            << (dlg.m_check->Tab(i)->IsEnabled() ? "+" : "-") << "|";
+    }
+    out << "\n";
+    out << "skin=" << g_Skin.GetSkinName() << "\n";
+    out << "language=" << g_Language.GetLanguageName() << "\n";
+    out << "corners=" << (dlg.HasFlag(wxFRAME_SHAPED) ? 1 : 0) << "\n";
+    DescribePanels(dlg, out);
+    out << "firstpaint_ms=" << dlg.m_firstPaintMs << "\n";
+    out << "resize_ms=" << dlg.m_lastBench << "\n";
+    return out.str();
+}
+
+void CTestHook::DescribePanels(const CAudioEncDlg& dlg, std::ostream& out) {
+    if (g_MediaList != nullptr) {
+        // Tab-separated: a cue track's type and source hold a '|' of their own.
+        XListCtrl* list = g_MediaList->List();
+        const std::vector<MediaItem*> items = g_MediaList->Items();
+        for (int row = 0; row < list->GetItemCount() && row < static_cast<int>(items.size());
+             ++row) {
+            MediaItem& item = *items[std::size_t(row)];
+            out << "row" << row << "=";
+            for (int column = 1; column <= 5; ++column) {
+                out << list->GetItemText(row, column) << "\t";
+            }
+            out << (list->GetCheckbox(row, 0) == 1 ? 1 : 0) << "\t"
+                << (list->IsSelected(row) ? 1 : 0) << "\t" << item.sourcePath << "\t"
+                << static_cast<int>(item.Status()) << "\n";
+            if (ParameterSet* set = SetOf(item)) {
+                out << "set" << row << "=";
+                for (const char* key : {"ab", "ar", "ac", "vol_factor", "acodec"}) {
+                    out << key << ":" << set->GetValue(key) << ";";
+                }
+                out << "volume:" << item.volume.load() << "\n";
+            }
+        }
+    }
+    if (g_OutputPanel != nullptr) {
+        out << "outdir=" << g_OutputPanel->GetOutputDirectory() << "\n";
+    }
+    if (g_SideBar != nullptr) {
+        out << g_SideBar->DescribeState() << "\n";
+    }
+    if (g_StatusWnd != nullptr) {
+        out << g_StatusWnd->DescribeState() << "\n";
+    }
+    std::string boxes;
+    for (std::string text : ShownBoxes()) {
+        std::replace(text.begin(), text.end(), '\n', ' ');
+        boxes += text + "|";
+    }
+    out << "boxes=" << boxes << "\n";
+    bool countdown = false;
+    for (wxWindow* window : wxTopLevelWindows) {
+        if (dynamic_cast<ImShutDownDlg*>(window) != nullptr && window->IsShown()) {
+            countdown = true;
+        }
+    }
+    out << "countdown=" << (countdown ? 1 : 0) << "\n";
+    out << "running=" << (dlg.m_convert && dlg.m_convert->Driver() ? dlg.m_convert->Driver()->ProcessCount() : 0)
+        << "\n";
+}
+
+void CTestHook::RunScriptCommand(CAudioEncDlg& dlg, const std::string& line) {
+    std::istringstream in(line);
+    std::string verb;
+    in >> verb;
+    std::string rest;
+    std::getline(in >> std::ws, rest);
+    in.clear();
+    in.str(rest);
+    if (verb == "add" && g_MediaList != nullptr) {
+        g_MediaList->AddFile(rest, -1);
+    } else if (verb == "addfolder" && g_MediaList != nullptr) {
+        g_MediaList->AddFolder(rest, -1);
+    } else if (verb == "outdir" && g_OutputPanel != nullptr) {
+        g_OutputPanel->SetDirectoryText(rest);
+        g_OutputPanel->CommitDirectory();
+    } else if (verb == "answer") {
+        QueueBoxAnswer(rest == "no" ? wxNO : wxYES);
+    } else if (verb == "dialog") {
+        // Presses OK or Cancel of the modal dialog in front; the program's own dialogs keep
+        // the resource ids 1 and 2 for them.
+        const bool ok = rest == "ok";
+        for (wxWindow* window : wxTopLevelWindows) {
+            auto* dialog = dynamic_cast<wxDialog*>(window);
+            if (dialog == nullptr || !dialog->IsModal()) {
+                continue;
+            }
+            const int okIds[] = {1, wxID_OK};
+            const int cancelIds[] = {2, wxID_CANCEL};
+            for (int id : ok ? okIds : cancelIds) {
+                if (wxWindow* button = dialog->FindWindow(id)) {
+                    wxCommandEvent press(wxEVT_BUTTON, id);
+                    press.SetEventObject(button);
+                    button->GetEventHandler()->ProcessEvent(press);
+                    return;
+                }
+            }
+            dialog->EndModal(ok ? wxID_OK : wxID_CANCEL);
+            return;
+        }
+    } else if (verb == "select" && g_MediaList != nullptr) {
+        int row = -1;
+        in >> row;
+        g_MediaList->SelectOnly(row);
+    } else if (verb == "grid" && g_SideBar != nullptr) {
+        // An edit in the advanced grid, committed as the grid's own editor commits it.
+        std::string key;
+        std::string value;
+        in >> key;
+        std::getline(in >> std::ws, value);
+        ParameterGrid* grid = g_SideBar->Grid();
+        const PropertyIterator item = grid->FindById(FindParameterIndex(key));
+        if (item.IsValid()) {
+            grid->Select(item);
+            grid->CommitEditText(value);
+        }
+    } else if (verb == "dialogtext") {
+        // Types into the first edit field of the modal dialog in front.
+        for (wxWindow* window : wxTopLevelWindows) {
+            auto* dialog = dynamic_cast<wxDialog*>(window);
+            if (dialog == nullptr || !dialog->IsModal()) {
+                continue;
+            }
+            for (wxWindow* child : dialog->GetChildren()) {
+                if (auto* edit = dynamic_cast<wxTextCtrl*>(child)) {
+                    edit->SetValue(wxString::FromUTF8(rest));
+                    break;
+                }
+            }
+            break;
+        }
+    } else if (verb == "saveas" && g_SideBar != nullptr) {
+        g_SideBar->SaveProfile(true);
+    } else if (verb == "rename" && g_SideBar != nullptr) {
+        g_SideBar->RenameProfile();
+    } else if (verb == "delete" && g_SideBar != nullptr) {
+        g_SideBar->DeleteProfile();
+    } else if (verb == "profile" && g_SideBar != nullptr) {
+        int index = 0;
+        in >> index;
+        g_SideBar->SelectIndex(index, true);
+    } else if (verb == "tab") {
+        int mode = 0;
+        in >> mode;
+        dlg.SwitchMode(mode);
+    } else if (verb == "command") {
+        int id = 0;
+        in >> id;
+        wxCommandEvent command(wxEVT_MENU, id);
+        dlg.OnCommand(command);
+    } else if (verb == "skin") {
+        std::string name;
+        in >> name;
+        for (const auto& [id, dir] : dlg.m_skinCommands) {
+            if (SkinNameOf(dir) == name) {
+                // The command rebuilds the menu and this map: leave the loop first.
+                wxCommandEvent command(wxEVT_MENU, id);
+                dlg.OnCommand(command);
+                break;
+            }
+        }
+    } else if (verb == "language") {
+        std::string name;
+        in >> name;
+        for (const auto& [id, language] : dlg.m_languageCommands) {
+            if (language == name) {
+                wxCommandEvent command(wxEVT_MENU, id);
+                dlg.OnCommand(command);
+                break;
+            }
+        }
+    } else if (verb == "move") {
+        int x = 0, y = 0, w = 0, h = 0;
+        in >> x >> y >> w >> h;
+        dlg.SetSize(x, y, w, h);
+    } else if (verb == "menu") {
+        int index = 0;
+        std::string key;
+        in >> index >> key;
+        if (ImMenuBar* bar = dlg.GetSkinMenuBar(false)) {
+            bar->OpenByIndex(index);
+            if (!key.empty() && bar->Popup() != nullptr) {
+                // "down" and "right" walk the open popup as the keyboard does.
+                for (char c : key) {
+                    bar->Popup()->OnKey(c == 'd' ? WXK_DOWN : c == 'r' ? WXK_RIGHT : WXK_UP);
+                }
+            }
+        }
+    } else if (verb == "benchresize") {
+        // Repaint time after a resize, for bench/skin_bench.sh: each step resizes and paints.
+        int steps = 50;
+        in >> steps;
+        const wxRect start = dlg.GetRect();
+        const wxLongLong begin = wxGetUTCTimeUSec();
+        for (int i = 0; i < steps; ++i) {
+            dlg.SetSize(start.width + (i % 10) * 12, start.height + (i % 7) * 9);
+            dlg.Update();
+        }
+        const double perStep = (wxGetUTCTimeUSec() - begin).ToDouble() / 1000.0 / steps;
+        dlg.SetSize(start);
+        dlg.m_lastBench = perStep;
+    } else if (verb == "close") {
+        dlg.Close();
+    }
+}
+
 
 void StartTestHook(CAudioEncDlg* dialog) {
     const char* dir = std::getenv("AUDIOCONV_TEST_DIR");
