@@ -112,6 +112,7 @@ std::string CTestHook::DescribeState(const CAudioEncDlg& dlg) {
         bar != nullptr && bar->GetMenu() != nullptr) {
         ImMenu* menu = bar->GetMenu();
         out << "menu=" << menu->resourceId << "\n";
+        out << "menuopen=" << (bar->Popup() != nullptr && bar->Popup()->IsPopupShown() ? 1 : 0) << "\n";
         out << "captions=";
         for (const auto& [caption, popup] : menu->tops) {
             out << caption.utf8_string() << "|";
@@ -130,6 +131,7 @@ std::string CTestHook::DescribeState(const CAudioEncDlg& dlg) {
     out << "skin=" << g_Skin.GetSkinName() << "\n";
     out << "language=" << g_Language.GetLanguageName() << "\n";
     out << "corners=" << (dlg.HasFlag(wxFRAME_SHAPED) ? 1 : 0) << "\n";
+    out << "maximized=" << (dlg.IsMaximized() ? 1 : 0) << "\n";
     DescribePanels(dlg, out);
     out << "firstpaint_ms=" << dlg.m_firstPaintMs << "\n";
     out << "resize_ms=" << dlg.m_lastBench << "\n";
@@ -313,6 +315,23 @@ void CTestHook::RunScriptCommand(CAudioEncDlg& dlg, const std::string& line) {
                 }
             }
         }
+    } else if (verb == "press" || verb == "key") {
+        // A mouse press on the list, or Escape with the list focused, sent as the toolkit sends
+        // them, so application-wide filters see them too.
+        wxWindow* target = g_MediaList != nullptr ? static_cast<wxWindow*>(g_MediaList->List()) : &dlg;
+        if (verb == "press") {
+            wxMouseEvent press(wxEVT_LEFT_DOWN);
+            press.SetEventObject(target);
+            press.SetId(target->GetId());
+            target->GetEventHandler()->ProcessEvent(press);
+        } else {
+            wxKeyEvent escape(wxEVT_KEY_DOWN);
+            escape.m_keyCode = WXK_ESCAPE;
+            escape.SetEventObject(target);
+            target->GetEventHandler()->ProcessEvent(escape);
+        }
+    } else if (verb == "maximize") {
+        dlg.Maximize(rest != "off");
     } else if (verb == "benchresize") {
         // Repaint time after a resize, for bench/skin_bench.sh: each step resizes and paints.
         int steps = 50;

@@ -185,6 +185,12 @@ void ImCaptionBar::OnMouse(wxMouseEvent& event) {
     wxWindow* top = wxGetTopLevelParent(this);
     const wxPoint screen = ClientToScreen(event.GetPosition());
     if (event.LeftDClick()) {
+        // As on any caption: a double click maximises or restores a window that may resize.
+        auto* frame = dynamic_cast<wxTopLevelWindow*>(top);
+        auto* skinned = dynamic_cast<ImSkinDialog*>(top);
+        if (frame != nullptr && skinned != nullptr && skinned->CanResize() && m_sysButtons->HasMaximize()) {
+            frame->Maximize(!frame->IsMaximized());
+        }
         return;
     }
     if (event.RightDown()) {

@@ -23,6 +23,11 @@ private:
     void OnMouse(wxMouseEvent& event);
     void Press(int button);
 
+public:
+    bool HasMaximize() const { return m_bHasMaximize; }
+
+private:
+
     SysButtonLayout m_layout;
     int m_state = 0;
     int m_hot = -1;

@@ -16,7 +16,8 @@ constexpr int kStatusStripId = 65535;
 
 ImSkinFrame::ImSkinFrame(const wxString& title, int dialogId)
     : wxFrame(nullptr, wxID_ANY, title, wxDefaultPosition, wxSize(640, 480),
-              wxBORDER_NONE | wxFRAME_SHAPED | wxMINIMIZE_BOX | wxCLIP_CHILDREN),
+              wxBORDER_NONE | wxFRAME_SHAPED | wxMINIMIZE_BOX | wxMAXIMIZE_BOX | wxRESIZE_BORDER |
+                  wxCLIP_CHILDREN),
       ImSkinDialog(this, dialogId) {
     InitSkinDialog();
     m_statusStrip = new ImStatusBarCtrl(this);
@@ -81,6 +82,13 @@ void ImSkinFrame::ApplyCorners() {
 
 void ImSkinFrame::InitialPlacement() {
     g_Skin.SetRoot(g_Language.GetBaseDir() + "\\Skin");
+    // The window manager learns the smallest size; without a largest one it offers maximise,
+    // and a window that cannot resize keeps its size at both ends.
+    if (CanResize()) {
+        SetSizeHints(m_minSize, m_maxSize.x >= 1 && m_maxSize.y >= 1 ? m_maxSize : wxDefaultSize);
+    } else {
+        SetSizeHints(GetSize(), GetSize());
+    }
     const std::string text = m_readSetting ? m_readSetting("window_rect") : std::string();
     const wxRect screen = wxDisplay(0u).GetClientArea();
     std::optional<SkinRect> rect;

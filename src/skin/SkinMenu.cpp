@@ -2,6 +2,7 @@
 
 #include "resources/Language.h"
 
+#include <wx/eventfilter.h>
 #include <wx/dcbuffer.h>
 #include <wx/dcclient.h>
 #include <wx/settings.h>
@@ -347,11 +348,54 @@ void ImMenuPopup::OnPaint(wxPaintEvent& /*event*/) {
 
 // --- ImMenuBar ----------------------------------------------------------------------------
 
+class ImMenuBar::DismissFilter : public wxEventFilter {
+public:
+    explicit DismissFilter(ImMenuBar* bar) : m_bar(bar) { wxEvtHandler::AddFilter(this); }
+    ~DismissFilter() override { wxEvtHandler::RemoveFilter(this); }
+
+    int FilterEvent(wxEvent& event) override {
+        const wxEventType type = event.GetEventType();
+        const bool press = type == wxEVT_LEFT_DOWN || type == wxEVT_RIGHT_DOWN || type == wxEVT_MIDDLE_DOWN;
+        const bool key = type == wxEVT_KEY_DOWN || type == wxEVT_CHAR_HOOK;
+        if ((!press && !key) || !m_bar->m_popup || !m_bar->m_popup->IsPopupShown()) {
+            return Event_Skip;
+        }
+        if (key) {
+            if (static_cast<wxKeyEvent&>(event).GetKeyCode() != WXK_ESCAPE) {
+                return Event_Skip;
+            }
+            m_bar->CloseMenus();
+            return Event_Processed;
+        }
+        // The press still reaches its window: a click on a list both closes the menu and selects.
+        if (!m_bar->OwnsWindow(wxDynamicCast(event.GetEventObject(), wxWindow))) {
+            m_bar->CloseMenus();
+        }
+        return Event_Skip;
+    }
+
+private:
+    ImMenuBar* m_bar;
+};
+
+bool ImMenuBar::OwnsWindow(const wxWindow* window) const {
+    if (window == this) {
+        return true;
+    }
+    for (const ImMenuPopup* popup = m_popup.get(); popup != nullptr; popup = popup->Child()) {
+        if (window == popup) {
+            return true;
+        }
+    }
+    return false;
+}
+
 ImMenuBar::ImMenuBar(wxWindow* parent, ImSkinDialog* owner)
     : wxWindow(parent, 1, wxDefaultPosition, wxSize(100, 30), wxBORDER_NONE | wxWANTS_CHARS),
       ImSkinObject(this, "menubar.bmp"),
       m_owner(owner) {
     SetBackgroundStyle(wxBG_STYLE_PAINT);
+    m_dismissFilter = std::make_unique<DismissFilter>(this);
     Bind(wxEVT_PAINT, &ImMenuBar::OnPaint, this);
     for (auto type :
          {wxEVT_MOTION, wxEVT_LEFT_DOWN, wxEVT_LEFT_UP, wxEVT_LEAVE_WINDOW, wxEVT_LEFT_DCLICK}) {
@@ -362,6 +406,7 @@ ImMenuBar::ImMenuBar(wxWindow* parent, ImSkinDialog* owner)
 }
 
 ImMenuBar::~ImMenuBar() {
+    m_dismissFilter.reset();
     (void)m_popup.release();
 }
 

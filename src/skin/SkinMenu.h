@@ -120,6 +120,11 @@ private:
     void OpenEntry(int index);
     wxString EntryText(int index) const;
 
+    // Closes open menus on a click anywhere else and on Escape, wherever the focus is.
+    class DismissFilter;
+    bool OwnsWindow(const wxWindow* window) const;
+    std::unique_ptr<DismissFilter> m_dismissFilter;
+
     MenuColours m_colours;
     std::unique_ptr<ImMenu> m_menu;
     int m_hot = -1;

@@ -3,6 +3,7 @@
 
 #include "../support/PackageDir.h"
 #include "../support/ProgramHarness.h"
+#include "../support/RunTool.h"
 
 #include <gtest/gtest.h>
 
@@ -38,6 +39,33 @@ TEST_F(MainWindowTest, FirstStartIsCentredAtItsDefaultSizeAndClosingRemembersThe
     }
     Program again(m_home);
     EXPECT_EQ(again.WaitShown().at("rect"), "30,40,900,700");
+}
+
+// The window tells the window manager its smallest size and no largest one, so it can be
+// resized and maximised; an open menu closes on a click elsewhere and on Escape.
+TEST_F(MainWindowTest, TheWindowResizesAndMaximisesAndMenusCloseWhenTheUserLooksElsewhere) {
+    Program program(m_home);
+    program.WaitShown();
+    const ac::test::ToolResult hints =
+        ac::test::RunTool("/usr/bin/xprop", {"-name", "Velmorant Audio Converter", "WM_NORMAL_HINTS"});
+    EXPECT_NE(hints.out.find("minimum size: 840 by 634"), std::string::npos) << hints.out;
+    // GTK states "no largest size" as a huge one; before, both ends were 840 by 634.
+    EXPECT_EQ(hints.out.find("maximum size: 840 by 634"), std::string::npos) << hints.out;
+    program.Send("move 10 10 1100 800");
+    State state = program.WaitFor([](const State& s) { return s.at("rect") == "10,10,1100,800"; });
+    EXPECT_EQ(state.at("rect"), "10,10,1100,800");
+    program.Send("move 10 10 300 200");
+    state = program.WaitFor([](const State& s) { return s.at("rect") != "10,10,1100,800"; });
+    EXPECT_EQ(state.at("rect"), "10,10,840,634") << "never smaller than the design size";
+
+    for (const char* away : {"press", "key"}) {
+        program.Send("menu 0");
+        state = program.WaitFor([](const State& s) { return s.count("menuopen") && s.at("menuopen") == "1"; });
+        ASSERT_EQ(state.at("menuopen"), "1");
+        program.Send(away);
+        state = program.WaitFor([](const State& s) { return s.at("menuopen") == "0"; });
+        EXPECT_EQ(state.at("menuopen"), "0") << away;
+    }
 }
 
 TEST_F(MainWindowTest, AbsurdRememberedRectanglesComeBackOnScreen) {
