@@ -12,6 +12,7 @@
 #include "skin/SkinLabels.h"
 #include "skin/WindowTranslation.h"
 
+#include <wx/dcclient.h>
 #include <wx/dnd.h>
 #include <wx/settings.h>
 
@@ -47,7 +48,6 @@ constexpr std::array<ColumnDef, 6> kColumns = {{{0, "", 32},
                                                 {108, "Type", 40},
                                                 {109, "Target", 96},
                                                 {110, "Status", 72}}};
-constexpr int kFixedColumnsWidth = 316;
 
 // XListCtrl offers no setter for a column once inserted; its columns are plain records.
 XListColumn& ColumnOf(XListCtrl& list, int column) {
@@ -287,8 +287,39 @@ void CMediaListWnd::OnButton(int id) {
 }
 
 void CMediaListWnd::FitColumns() {
+    // Status words and the duration are as wide as the language and the font make them
+    // ("Abgeschlossen" in German): measured, so none is cut. The name takes the rest.
+    wxClientDC dc(m_list->Body());
+    dc.SetFont(m_list->Body()->GetFont());
+    constexpr int kPadding = 14;
+    auto widest = [&](int column, std::initializer_list<std::string> texts) {
+        int best = dc.GetTextExtent(wxString::FromUTF8(ColumnOf(*m_list, column).text)).x;
+        for (const std::string& text : texts) {
+            best = std::max(best, dc.GetTextExtent(wxString::FromUTF8(text)).x);
+        }
+        return best + kPadding;
+    };
+    std::initializer_list<std::string> noTexts = {};
+    std::vector<std::string> statusWords;
+    for (int status = -1; status <= 8; ++status) {
+        if (const std::uint32_t id = StatusTextId(static_cast<JobStatus>(status))) {
+            statusWords.push_back(g_Language.GetString(id));
+        }
+    }
+    int statusWidth = widest(kColStatus, noTexts);
+    for (const std::string& word : statusWords) {
+        statusWidth = std::max(statusWidth, dc.GetTextExtent(wxString::FromUTF8(word)).x + kPadding);
+    }
+    ColumnOf(*m_list, kColStatus).width = std::max(kColumns[kColStatus].width, statusWidth);
+    ColumnOf(*m_list, kColDuration).width = std::max(kColumns[kColDuration].width, widest(kColDuration, {"00:00:00"}));
+    int fixed = 0;
+    for (int column = 0; column < static_cast<int>(kColumns.size()); ++column) {
+        if (column != kColName) {
+            fixed += ColumnOf(*m_list, column).width;
+        }
+    }
     const int width = m_list->Body()->GetClientSize().x;
-    ColumnOf(*m_list, kColName).width = std::max(60, width - kFixedColumnsWidth);
+    ColumnOf(*m_list, kColName).width = std::max(60, width - fixed);
     m_list->Refresh();
 }
 
