@@ -15,6 +15,7 @@
 #include "skin/SkinManager.h"
 #include "skin/UiQueueWx.h"
 
+#include <wx/dcclient.h>
 #include <wx/app.h>
 #include <wx/frame.h>
 #include <wx/image.h>
@@ -414,8 +415,17 @@ TEST_F(MediaListWindowTest, SkinnedButtonRowStandsAroundEncode) {
     EXPECT_EQ(at[1001].x, 2);
     EXPECT_EQ(at[1001].width, 700 - 4);
     EXPECT_LE(at[1001].GetBottom(), at[1225].y);
-    EXPECT_EQ(m_list->List()->Columns()[kColName].width,
-              m_list->List()->Body()->GetClientSize().x - 316);
+    // The name takes what the other columns leave, and they are as wide as their words.
+    int others = 0;
+    for (int column = 0; column < static_cast<int>(m_list->List()->Columns().size()); ++column) {
+        if (column != kColName) {
+            others += m_list->List()->Columns()[std::size_t(column)].width;
+        }
+    }
+    EXPECT_EQ(m_list->List()->Columns()[kColName].width, m_list->List()->Body()->GetClientSize().x - others);
+    wxClientDC dc(m_list->List()->Body());
+    dc.SetFont(m_list->List()->Body()->GetFont());
+    EXPECT_GT(m_list->List()->Columns()[kColStatus].width, dc.GetTextExtent("Unknown file").x);
 }
 
 TEST_F(MediaListWindowTest, OutputPanelKeepsAFolderPerModeAndTrimsIt) {

@@ -192,10 +192,15 @@ TEST_F(ChildProcessTest, StalePartFilesAreSweptAndLiveOnesKept) {
     dead.WaitForExit();
     const int deadPid = dead.ProcessId();
     // A live process that is the tool (named ctt), and a live one that is not.
-    fs::copy_file("/bin/sleep", dir / "ctt");
+    // A link, not a copy: a copy still open for writing in some forked child cannot be run.
+    fs::create_symlink("/bin/sleep", dir / "ctt");
     Capture tool, stranger;
     ASSERT_TRUE(tool.Launch("\"" + dir / "ctt" + "\" 60"));
     ASSERT_TRUE(stranger.Launch("/bin/sleep 60"));
+    const std::string comm = "/proc/" + std::to_string(tool.ProcessId()) + "/comm";
+    for (int i = 0; i < 400 && test::ReadFile(comm) != "ctt\n"; ++i)
+        std::this_thread::sleep_for(std::chrono::milliseconds(5));
+    ASSERT_EQ(test::ReadFile(comm), "ctt\n");
     const std::string a = PartFilePath(folder + "/a.mp3", deadPid);
     const std::string b = PartFilePath(folder + "/b.mp3", tool.ProcessId());
     const std::string c = PartFilePath(folder + "/c.mp3", stranger.ProcessId());
