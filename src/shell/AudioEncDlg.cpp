@@ -447,6 +447,9 @@ void CAudioEncDlg::OnCommand(wxCommandEvent& event) {
             LoadModeMenu(GetWorkMode());
             return;
         }
+        case cmd::kContents:
+            OpenHelpPage(GetAppConfig().GetBaseDirectory() + "/help/Default.htm", this);
+            return;
         case cmd::kSupport:
             wxLaunchDefaultBrowser("https://velmorant.example/support");
             return;

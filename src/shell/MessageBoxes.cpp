@@ -2,6 +2,8 @@
 
 #include "shell/AppConfig.h"
 
+#include <wx/filename.h>
+#include <wx/utils.h>
 #include <wx/msgdlg.h>
 
 #include <cstdlib>
@@ -41,6 +43,25 @@ void QueueBoxAnswer(int answer) {
 
 const std::vector<std::string>& ShownBoxes() {
     return s_shown;
+}
+
+void OpenHelpPage(const std::string& path, wxWindow* parent) {
+    if (!wxFileName::FileExists(wxString::FromUTF8(path))) {
+        AppMessageBox("The help page " + path + " is missing.", wxOK | wxICON_ERROR, parent);
+        return;
+    }
+    const wxString url = wxFileName::FileNameToURL(wxFileName(wxString::FromUTF8(path)));
+    wxString browser;
+    if (wxGetEnv("BROWSER", &browser) && !browser.empty()) {
+        const char* argv[] = {nullptr, nullptr, nullptr};
+        const wxScopedCharBuffer program = browser.utf8_str();
+        const wxScopedCharBuffer address = url.utf8_str();
+        argv[0] = program.data();
+        argv[1] = address.data();
+        wxExecute(argv, wxEXEC_ASYNC);
+        return;
+    }
+    wxLaunchDefaultBrowser(url);
 }
 
 }  // namespace ac

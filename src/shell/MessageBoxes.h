@@ -17,6 +17,10 @@ namespace ac {
 // wxNO, wxOK or wxCANCEL.
 int AppMessageBox(const std::string& text, long style, wxWindow* parent = nullptr);
 
+// Opens a page of the program's help in the user's browser ($BROWSER when it is set, else the
+// desktop's default through xdg-open); a missing page is said in a box.
+void OpenHelpPage(const std::string& path, wxWindow* parent);
+
 // For the test hook.
 bool BoxesAreScripted();
 void QueueBoxAnswer(int answer);

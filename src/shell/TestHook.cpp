@@ -330,6 +330,8 @@ void CTestHook::RunScriptCommand(CAudioEncDlg& dlg, const std::string& line) {
             escape.SetEventObject(target);
             target->GetEventHandler()->ProcessEvent(escape);
         }
+    } else if (verb == "advanced" && g_SideBar != nullptr) {
+        g_SideBar->ApplyMode(rest != "off");
     } else if (verb == "maximize") {
         dlg.Maximize(rest != "off");
     } else if (verb == "benchresize") {

@@ -8,6 +8,7 @@
 #include <gtest/gtest.h>
 
 #include <filesystem>
+#include <fstream>
 #include <thread>
 
 namespace {
@@ -66,6 +67,25 @@ TEST_F(MainWindowTest, TheWindowResizesAndMaximisesAndMenusCloseWhenTheUserLooks
         state = program.WaitFor([](const State& s) { return s.at("menuopen") == "0"; });
         EXPECT_EQ(state.at("menuopen"), "0") << away;
     }
+}
+
+// Help > Contents opens the program's own pages, installed beside its data, in the browser.
+TEST_F(MainWindowTest, HelpContentsOpensTheProgramsOwnPagesInTheBrowser) {
+    const std::string opened = m_home / "opened.txt";
+    const std::string browser = m_home / "browser.sh";
+    std::ofstream(browser) << "#!/bin/sh\necho \"$1\" > '" << opened << "'\n";
+    std::filesystem::permissions(browser, std::filesystem::perms::owner_all);
+    ::setenv("BROWSER", browser.c_str(), 1);
+    Program program(m_home);
+    program.WaitShown();
+    program.Send("command 32900");
+    program.WaitFor([&](const State&) { return !Program::Slurp(opened).empty(); });
+    ::unsetenv("BROWSER");
+    const std::string url = Program::Slurp(opened);
+    EXPECT_EQ(url.rfind("file://", 0), 0u) << url;
+    EXPECT_NE(url.find("/help/Default.htm"), std::string::npos) << url;
+    const std::string page = url.substr(7, url.size() - 8);
+    EXPECT_NE(Program::Slurp(page).find("<h1>Velmorant Audio Converter</h1>"), std::string::npos) << page;
 }
 
 TEST_F(MainWindowTest, AbsurdRememberedRectanglesComeBackOnScreen) {
