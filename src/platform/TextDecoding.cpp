@@ -1,4 +1,4 @@
-#include "medialist/TextDecoding.h"
+#include "platform/TextDecoding.h"
 
 #include <iconv.h>
 #include <uchardet.h>
