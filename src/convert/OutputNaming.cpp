@@ -70,6 +70,8 @@ std::string LetterText(char letter, ParameterSet& parameters, int row, const std
     }
 }
 
+}  // namespace
+
 std::string SchemePattern(std::string_view allScheme, int scheme) {
     for (int i = 0; i < scheme; ++i) {
         const std::size_t comma = allScheme.find(',');
@@ -78,6 +80,8 @@ std::string SchemePattern(std::string_view allScheme, int scheme) {
     }
     return std::string(allScheme.substr(0, allScheme.find(',')));
 }
+
+namespace {
 
 std::string JoinPath(std::string_view directory, const std::string& base, std::string_view extension) {
     std::string name = base + "." + std::string(extension);
@@ -175,6 +179,26 @@ bool IsOutputHeld(std::string_view path) {
 
 OutputHold HoldOutputPath(std::string path) {
     std::lock_guard lock(s_heldMutex);
+    OutputHold hold;
+    hold.m_path = std::move(path);
+    s_held.push_back(hold.m_path);
+    return hold;
+}
+
+OutputHold ReserveFreePath(std::string_view directory, std::string base, std::string_view extension,
+                           int firstSuffix, bool replaceExisting, const FileExistsFn& exists) {
+    const std::size_t fixedPart = 1 + extension.size() + kSearchSuffixRoom;
+    CutUtf8(base, fixedPart < kNameMax ? kNameMax - fixedPart : 0);
+    while (!directory.empty() && directory.back() == '/') directory.remove_suffix(1);
+
+    std::lock_guard lock(s_heldMutex);
+    std::string path = JoinPath(directory, base, extension);
+    auto taken = [&](const std::string& candidate) {
+        return HeldLocked(candidate) || (!replaceExisting && exists(candidate));
+    };
+    for (int n = firstSuffix; n < firstSuffix + 1'000'000 && taken(path); ++n) {
+        path = JoinPath(directory, base + "-" + std::to_string(n), extension);
+    }
     OutputHold hold;
     hold.m_path = std::move(path);
     s_held.push_back(hold.m_path);

@@ -75,6 +75,8 @@ private:
     friend OutputHold ReserveOutputPath(ParameterSet&, const OutputNameRequest&,
                                         const NamingSettings&, const FileExistsFn&);
     friend OutputHold HoldOutputPath(std::string path);
+    friend OutputHold ReserveFreePath(std::string_view, std::string, std::string_view, int, bool,
+                                      const FileExistsFn&);
     std::string m_path;
 };
 
@@ -84,6 +86,18 @@ bool IsOutputHeld(std::string_view path);
 
 // Holds a path named some other way (a fixed name of a test, a temporary file).
 OutputHold HoldOutputPath(std::string path);
+
+// The pattern of the naming scheme at index `scheme` of the comma-separated list; an index
+// behind the end selects the last pattern.
+std::string SchemePattern(std::string_view allScheme, int scheme);
+
+// Finds and holds a free name in `directory`: base.ext, else base-N.ext for N from
+// `firstSuffix` on. Names held by jobs of this process are never chosen; files on disk are
+// passed over unless `replaceExisting`. `base` is cut to leave room for the extension and the
+// number within the file system's name limit. For drivers that make their own base names.
+OutputHold ReserveFreePath(std::string_view directory, std::string base, std::string_view extension,
+                           int firstSuffix, bool replaceExisting,
+                           const FileExistsFn& exists = PathExistsOnDisk);
 
 // MakeOutputPath and the hold of its result in one step, so drivers on several threads cannot
 // both take one free name.
