@@ -88,9 +88,19 @@ bool IsFileBacked(const CdIo_t* handle) {
     return (misc & CDIO_DRIVE_CAP_MISC_FILE) != 0;
 }
 
-std::string ReadText(const std::string& path) {
+// Cue sheets and tocs are text of a few kilobytes (99 tracks with CD-Text stay far below this);
+// a large file under such a name is no sheet and is not read whole.
+constexpr std::uintmax_t kMaxSheetBytes = 1 << 20;
+
+bool ReadSheet(const std::string& path, std::string& text) {
+    std::error_code error;
+    const std::uintmax_t size = fs::file_size(path, error);
+    if (error || size > kMaxSheetBytes) {
+        return false;
+    }
     std::ifstream in(path, std::ios::binary);
-    return std::string(std::istreambuf_iterator<char>(in), std::istreambuf_iterator<char>());
+    text.assign(std::istreambuf_iterator<char>(in), std::istreambuf_iterator<char>());
+    return true;
 }
 
 // libcdio resolves the FILE names of a .toc against the process's current directory, and
@@ -121,6 +131,26 @@ bool AbsoluteTocText(const std::string& text, const std::string& folder, std::st
         out += '\n';
     }
     return changed;
+}
+
+// libcdio keeps the FILE name of a cue sheet that has no TRACK and never frees it; the poll reads
+// every image once a second, so such a sheet is turned away before libcdio sees it.
+bool CueHasTrack(const std::string& text) {
+    std::istringstream lines(text);
+    std::string word;
+    std::string line;
+    while (std::getline(lines, line)) {
+        std::istringstream words(line);
+        if (words >> word && word.size() == 5) {
+            for (char& c : word) {
+                c = static_cast<char>(std::toupper(static_cast<unsigned char>(c)));
+            }
+            if (word == "TRACK") {
+                return true;
+            }
+        }
+    }
+    return false;
 }
 
 // A temporary .toc, removed with the object.
@@ -259,11 +289,16 @@ public:
             return handle && ReadTable(handle.get(), false, table);
         }
         std::lock_guard lock(s_imageMutex);
-        if (driver == DRIVER_CDRDAO) {
+        const std::string extension = LowerExtension(drive);
+        if (extension == ".cue" || extension == ".toc") {
+            std::string text;
+            if (!ReadSheet(drive, text) || (extension == ".cue" && !CueHasTrack(text))) {
+                return false;
+            }
             std::string absolute;
             std::error_code error;
-            const std::string folder = fs::absolute(fs::path(drive), error).parent_path().string();
-            if (AbsoluteTocText(ReadText(drive), folder, absolute)) {
+            const fs::path folder = fs::absolute(fs::path(drive), error).parent_path();
+            if (extension == ".toc" && AbsoluteTocText(text, folder.string(), absolute)) {
                 const TocCopy copy(absolute);
                 return !copy.Path().empty() && ReadImage(copy.Path(), driver, table);
             }

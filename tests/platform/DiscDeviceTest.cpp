@@ -151,7 +151,11 @@ TEST(DiscDeviceTest, BrokenImagesAreNoDisc) {
 
     test::WriteFile(dir / "notracks.cue", "FILE \"notracks.bin\" BINARY\n");
     test::WriteFile(dir / "notracks.bin", std::string(10 * test::kSectorBytes, '\0'));
-    expectNoDisc(dir / "notracks.cue");
+    expectNoDisc(dir / "notracks.cue");  // libcdio would keep a string of it for ever
+
+    test::WriteFile(dir / "large.cue", "");
+    fs::resize_file(dir / "large.cue", 4u << 20);
+    expectNoDisc(dir / "large.cue");
 
     // A toc of only SILENCE: libcdio places its track before the disc's start.
     expectNoDisc(AC_CORPUS_DIR "/discimg/libcdio_cdtext.toc");
