@@ -1,5 +1,7 @@
 #include "ConsoleRun.h"
 
+#include "ProgressLine.h"
+
 #include <algorithm>
 #include <chrono>
 #include <filesystem>
@@ -7,7 +9,6 @@
 namespace ac::console {
 namespace {
 
-constexpr int kBarWidth = 30;
 constexpr auto kDrawPeriod = std::chrono::milliseconds(200);
 
 bool IsEnded(JobStatus s) {
@@ -29,11 +30,6 @@ const char* StatusWord(JobStatus s) {
         default:
             return "";
     }
-}
-
-std::string Bar(int percent) {
-    int filled = std::clamp(percent, 0, 100) * kBarWidth / 100;
-    return std::string(filled, '#') + std::string(kBarWidth - filled, '-');
 }
 
 }  // namespace
@@ -101,7 +97,7 @@ bool ConsoleRun::AllEnded() {
 void ConsoleRun::ReportEnded(int row, JobStatus status, int overall) {
     MediaItem* item = GetItem(row);
     if (m_drawBar)
-        std::fputs("\r\033[K", m_out);
+        ClearProgressLine(m_out);
     std::fprintf(m_out, "[%d/%d] %s: %s", row + 1, GetRowCount(), StatusWord(status),
                  item->sourcePath.c_str());
     if (status == JobStatus::Completed)
@@ -148,10 +144,7 @@ void ConsoleRun::Draw(EncodingDriver& driver, bool final) {
                 break;
             }
         }
-        if (current.size() > 28)
-            current = current.substr(0, 25) + "...";
-        std::fprintf(m_out, "\r\033[K%-28s %3d%% [%s] all %3d%%", current.c_str(), percent,
-                     Bar(percent).c_str(), overall);
+        DrawProgressLine(m_out, current, percent, overall);
     }
     std::fflush(m_out);
 }
@@ -186,7 +179,7 @@ int ConsoleRun::Run(DriverConfig config, OutputNamer namer, CommandBuilder build
             child->WaitForExit();
     Draw(driver, true);
     if (m_drawBar)
-        std::fputs("\r\033[K", m_out);
+        ClearProgressLine(m_out);
 
     int completed = 0;
     for (int row = 0; row < GetRowCount(); ++row)

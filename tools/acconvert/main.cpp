@@ -7,6 +7,7 @@
 // 2 for a usage error, 130 after Ctrl-C (children ended, partial outputs removed).
 
 #include "ConsoleRun.h"
+#include "ProfileLookup.h"
 
 #include "convert/CommandLine.h"
 #include "convert/OutputNaming.h"
@@ -16,8 +17,6 @@
 #include "medialist/MediaProbe.h"
 #include "platform/Paths.h"
 #include "profile/ParameterSet.h"
-#include "resources/Package.h"
-#include "resources/PackageWriter.h"
 #include "rip/CueExpansion.h"
 #include "shell/AppConfig.h"
 
@@ -27,7 +26,6 @@
 #include <cstdlib>
 #include <cstring>
 #include <filesystem>
-#include <fstream>
 #include <string>
 #include <vector>
 #include <unistd.h>
@@ -59,20 +57,6 @@ constexpr const char* kUsage = "usage: acconvert [--profile NAME|PATH] [--out DI
 
 void Usage() { std::fputs(kUsage, stderr); }
 
-// The profiles a user can name: system profiles first, then the user's own.
-void PrintProfiles(const std::string& base) {
-    for (const char* folder : {"\\profile\\", "\\profile\\user\\"}) {
-        ImPackageFinder finder;
-        for (bool more = finder.FindFile(base + folder + "*.pf"); more; more = finder.FindNextFile()) {
-            std::string file = finder.GetFileName();
-            if (file.size() > 3)
-                file.resize(file.size() - 3);
-            Profile profile(finder.GetFilePath());
-            std::printf("  %-12s %s\n", file.c_str(), profile.IsLoaded() ? profile.GetName().c_str() : "");
-        }
-    }
-}
-
 void Help(const std::string& base) {
     std::fputs(kUsage, stdout);
     std::puts("\nConverts audio and video files, and the tracks of cue sheets, into audio files with the\n"
@@ -84,7 +68,7 @@ void Help(const std::string& base) {
               "Exit status: 0 when every file converted, 1 when some did not, 2 for a usage error,\n"
               "130 when stopped (Ctrl-C); a stopped run leaves no partial file.\n\n"
               "Profiles:");
-    PrintProfiles(base);
+    console::PrintProfiles(base, stdout);
 }
 
 bool ParseArguments(int argc, char** argv, Options& options) {
@@ -141,68 +125,6 @@ bool InputUsable(const std::string& file) {
     return true;
 }
 
-// Held through its base: the profile keeps its value lists in a type of its own.
-std::unique_ptr<ParameterSet> LoadProfile(const std::string& path) {
-    auto* profile = new Profile(path);
-    std::unique_ptr<ParameterSet> owner(profile);
-    return profile->IsLoaded() ? std::move(owner) : nullptr;
-}
-
-// Profiles are read through the package layer only, so a .pf file given on the command line
-// travels in a one-entry package of its own in a scratch folder, removed when the run ends.
-class LoosePackage {
-public:
-    ~LoosePackage() {
-        std::error_code ignored;
-        if (!m_folder.empty())
-            fs::remove_all(m_folder, ignored);
-    }
-    std::string Wrap(const std::string& file) {
-        std::string pattern = (fs::temp_directory_path() / "acconvert-XXXXXX").string();
-        if (!::mkdtemp(pattern.data()))
-            return {};
-        m_folder = pattern;
-        std::ifstream in(file, std::ios::binary);
-        std::string text((std::istreambuf_iterator<char>(in)), {});
-        // The package's ini reader splits at CR LF, the line end profiles have always had.
-        if (text.find("\r\n") == std::string::npos) {
-            std::string crlf;
-            for (char c : text)
-                c == '\n' ? crlf += "\r\n" : crlf += c;
-            text.swap(crlf);
-        }
-        PackageWriter writer;
-        std::string package = m_folder + "/cli.pkg";
-        if (!writer.Create() || !writer.Put("cli.pf", text) || !writer.Commit(package))
-            return {};
-        return package + "\\cli.pf";
-    }
-
-private:
-    std::string m_folder;
-};
-
-// A file on disk, else a system profile, else a user profile, by file name or shown name.
-std::unique_ptr<ParameterSet> FindProfile(const std::string& wanted, const std::string& base,
-                                          LoosePackage& loose) {
-    if (fs::is_regular_file(wanted))
-        return LoadProfile(loose.Wrap(wanted));
-    for (const char* folder : {"\\profile\\", "\\profile\\user\\"}) {
-        std::string direct = base + folder + wanted + ".pf";
-        if (ResourceExists(direct))
-            if (auto profile = LoadProfile(direct))
-                return profile;
-        ImPackageFinder finder;
-        for (bool more = finder.FindFile(base + folder + "*.pf"); more;
-             more = finder.FindNextFile()) {
-            auto profile = LoadProfile(finder.GetFilePath());
-            if (profile && profile->GetName() == wanted)
-                return profile;
-        }
-    }
-    return nullptr;
-}
-
 // name: what the list shows in its Name column, which also names the output.
 std::unique_ptr<MediaItem> MakeRow(const std::string& sourcePath, const std::string& name,
                                    const ParameterSet& profile) {
@@ -257,8 +179,8 @@ int main(int argc, char** argv) {
     }
     if (!CheckPaths(options))
         return 2;
-    LoosePackage loose;
-    std::unique_ptr<ParameterSet> profile = FindProfile(options.profile, base, loose);
+    console::LoosePackage loose;
+    std::unique_ptr<ParameterSet> profile = console::FindProfile(options.profile, base, loose);
     if (!profile) {
         std::fprintf(stderr, "acconvert: no profile named %s\n", options.profile.c_str());
         return 2;
