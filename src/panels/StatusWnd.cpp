@@ -162,9 +162,9 @@ void CStatusWnd::OnStatusTimer() {
             }
             break;
         case 1:
-            // FIXME: the rip panel's run counters are not on the hub yet; until they are, the rip
-            // bar reads as a rip that is not running (RipPercent does the arithmetic).
-            m_bar->SetPosition(0);
+            m_bar->SetPosition(hub->IsRipRunActive()
+                                   ? RipPercent(hub->RipDoneSeconds(), hub->RipTotalSeconds())
+                                   : 0);
             break;
         case 2:
             break;  // the creator panel moves the gauge itself

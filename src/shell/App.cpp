@@ -46,7 +46,7 @@ void ChooseLanguage(ac::AppConfig& config) {
     ac::g_Language.Init(config.GetBaseDirectory(), name);
 }
 
-// The program's command ids come from its menu resources and run up to 33204, beyond the
+// The program's command ids come from its menu resources and run up to 33210, beyond the
 // 0x7FFF that wx's menus check for; they work all the same, so only that check is silenced.
 wxAssertHandler_t s_defaultAssertHandler = nullptr;
 

@@ -4,6 +4,7 @@
 #include "medialist/ui/OutputPanelWnd.h"
 #include "panels/ProgramDialogs.h"
 #include "panels/StatusWnd.h"
+#include "platform/DiscDevice.h"
 #include "platform/Paths.h"
 #include "profile/ui/ParameterGrid.h"
 #include "profile/ui/SaveProfileDlg.h"
@@ -15,6 +16,7 @@
 #include "shell/MenuTables.h"
 #include "shell/MessageBoxes.h"
 #include "shell/ProgramIcon.h"
+#include "shell/RipMode.h"
 #include "convert/RowParameters.h"
 #include "skin/ShutDownDlg.h"
 #include "skin/ChooseSkinDlg.h"
@@ -96,6 +98,9 @@ CAudioEncDlg::~CAudioEncDlg() {
     if (m_convert) {
         m_convert->Shutdown();
     }
+    if (g_RipDlg != nullptr) {
+        g_RipDlg->SetModeHost(nullptr);
+    }
     if (GetMainHub() == this) {
         SetMainHub(nullptr);
     }
@@ -132,6 +137,7 @@ void CAudioEncDlg::OnInitDialog() {
     if (mode < 0 || mode > 2) {
         mode = 0;
     }
+    m_rip = std::make_unique<CRipMode>(this, *g_RipDlg);
     LoadModeMenu(mode);
     m_convert = std::make_unique<CConvertMode>(this);
     m_convert->SetWorkMode(mode);
@@ -153,10 +159,9 @@ void CAudioEncDlg::CreatePanels() {
     m_panels[MediaList] = new CMediaListWnd(this);
     m_panels[Output] = new COutputPanelWnd(this);
     m_panels[Player] = new ImSkinPanel(this, 1008, "PlayerPanel");
-    m_panels[Rip] = new ImSkinPanel(this, 1063, "CDRip");
-    // The context menus of the lists still to come; the media list opens its own.
-    const std::pair<Panel, int> contextMenus[] = {{Rip, kRipListContextMenu},
-                                                  {Creator, kBurnListContextMenu}};
+    m_panels[Rip] = new CDRipDlg(this, platform::MakeDiscDevice());
+    // The context menu of the list still to come; the media and rip lists open their own.
+    const std::pair<Panel, int> contextMenus[] = {{Creator, kBurnListContextMenu}};
     for (const auto& [panel, menuId] : contextMenus) {
         m_panels[panel]->Bind(wxEVT_CONTEXT_MENU, [this, menuId = menuId](wxContextMenuEvent&) {
             std::unique_ptr<wxMenu> menu = BuildContextMenu(menuId);
@@ -175,10 +180,16 @@ void CAudioEncDlg::ShowModePanel(int mode) {
     if (g_MediaList != nullptr && mode != 0 && g_MediaList->IsShown()) {
         g_MediaList->OnHidePanel();
     }
+    if (g_RipDlg != nullptr && mode != 1 && g_RipDlg->IsShown()) {
+        g_RipDlg->OnHidePanel();
+    }
     m_panels[MediaList]->Show(mode == 0);
     m_panels[Rip]->Show(mode == 1);
     m_panels[Creator]->Show(mode == 2);
     m_check->ShowMode(mode);
+    if (g_RipDlg != nullptr && mode == 1) {
+        g_RipDlg->OnShowPanel();
+    }
 }
 
 void CAudioEncDlg::SwitchMode(int mode) {
@@ -218,6 +229,9 @@ void CAudioEncDlg::SwitchMode(int mode) {
 
 void CAudioEncDlg::LoadModeMenu(int mode) {
     std::unique_ptr<ImMenu> menu = BuildModeMenu(mode);
+    if (wxMenu* drives = SelectCdRomPopup(*menu); drives != nullptr && m_rip) {
+        m_rip->FillDriveMenu(*drives);
+    }
     if (wxMenu* options = OptionsPopup(*menu)) {
         FillSkinMenu(*options->FindItemByPosition(0)->GetSubMenu());
         FillLanguageMenu(*options->FindItemByPosition(1)->GetSubMenu());
@@ -257,6 +271,12 @@ void CAudioEncDlg::FillLanguageMenu(wxMenu& popup) {
 }
 
 void CAudioEncDlg::OnInitMenuPopup(wxMenu* menu) {
+    // The drives change under the menu (an image added, a disc found in another drive).
+    if (m_rip && GetWorkMode() == 1) {
+        if (wxMenuItem* entry = menu->FindItem(ripcmd::kAddDiscImage); entry && entry->GetMenu()) {
+            m_rip->FillDriveMenu(*entry->GetMenu());
+        }
+    }
     ApplyEnableRules(*menu);
     for (int id = cmd::kAfterFirst; id <= cmd::kAfterLast; ++id) {
         if (wxMenuItem* item = menu->FindChildItem(id)) {
@@ -343,6 +363,10 @@ void CAudioEncDlg::OnTimer(wxTimerEvent& event) {
         wxGetDiskSpace(wxString::FromUTF8(path), nullptr, &freeBytes) &&
         freeBytes.GetValue() < kLowDiskBytes) {
         // Stopping a run belongs to the mode's panel; with no run there is nothing to stop.
+        if (mode == 1 && g_RipDlg != nullptr && g_RipDlg->Driver().IsRunning()) {
+            g_RipDlg->Driver().StopRip(false);
+            AppMessageBox(g_Language.GetString(0xC000), wxOK | wxICON_ERROR, this);
+        }
         if (mode == 2) {
             m_diskTimer.Stop();
         }
@@ -370,8 +394,9 @@ void CAudioEncDlg::FromTray() {
 }
 
 bool CAudioEncDlg::RunStopLogic() {
-    // Rip and burn runs come with their panels; only the convert mode can refuse yet.
-    m_bCloseAccepted = GetWorkMode() != 0 || !m_convert || m_convert->StopForClose();
+    // A rip keeps running in the background of another tab, so its question comes in any mode.
+    m_bCloseAccepted = (GetWorkMode() != 0 || !m_convert || m_convert->StopForClose()) &&
+                       (!m_rip || m_rip->StopForClose());
     return m_bCloseAccepted;
 }
 
@@ -419,6 +444,13 @@ void CAudioEncDlg::OnCommand(wxCommandEvent& event) {
         if (m_convert) {
             m_convert->SetAfterConvertAction(m_afterConvert);
         }
+        if (m_rip) {
+            m_rip->SetAfterRunAction(m_afterConvert);
+        }
+        return;
+    }
+    if (m_rip && GetWorkMode() == 1 && m_rip->IsOwnCommand(id)) {
+        m_rip->OnCommand(id);
         return;
     }
     // Commands of another mode do nothing when they arrive anyway.

@@ -22,6 +22,7 @@ namespace ac {
 
 class CCheck;
 class CConvertMode;
+class CRipMode;
 class ImMenuBar;
 
 inline constexpr int kMainDialogId = 102;
@@ -70,6 +71,9 @@ public:
     double RunDoneSeconds() override;
     double RunTotalSeconds() override;
     std::string RunProgressText() override;
+    bool IsRipRunActive() override;
+    double RipDoneSeconds() override;
+    double RipTotalSeconds() override;
 
 private:
     friend class CTestHook;
@@ -99,6 +103,7 @@ private:
     wxTimer m_selectionTimer;
     std::unique_ptr<wxTaskBarIcon> m_tray;
     std::unique_ptr<CConvertMode> m_convert;
+    std::unique_ptr<CRipMode> m_rip;
     bool m_gridEditable = true;
     bool m_bInTray = false;
     bool m_bCloseAccepted = true;

@@ -11,6 +11,7 @@
 #include "shell/Check.h"
 #include "shell/ConvertMode.h"
 #include "shell/MenuTables.h"
+#include "shell/RipMode.h"
 #include "skin/WxTranslate.h"
 
 #include <wx/menu.h>
@@ -29,6 +30,9 @@ void CAudioEncDlg::DispatchCommand(int id) {
 }
 
 bool CAudioEncDlg::IsCommandEnabled(int commandId) {
+    if (GetWorkMode() == 1 && m_rip && m_rip->IsOwnCommand(commandId)) {
+        return m_rip->IsCommandEnabled(commandId);
+    }
     if (GetWorkMode() == 0 && m_convert && m_convert->IsOwnCommand(commandId)) {
         return m_convert->IsCommandEnabled(commandId);
     }
@@ -134,8 +138,10 @@ void CAudioEncDlg::UpdateGridEditable() {
             }
             editable = true;
         }
+    } else if (GetWorkMode() == 1) {
+        editable = g_RipDlg != nullptr && g_RipDlg->IsDiscLoaded() && !g_RipDlg->Driver().IsRunning();
     } else {
-        editable = true;  // the rip and burn lists bring their own rules with their panels
+        editable = true;  // the burn list brings its own rules with its panel
     }
     if (editable != m_gridEditable) {
         m_gridEditable = editable;
@@ -169,7 +175,11 @@ bool CAudioEncDlg::IsBitRateFree(const std::string& extension) {
 }
 
 void CAudioEncDlg::ApplyProfile(Profile& profile) {
-    if (g_MediaList != nullptr) {
+    if (GetWorkMode() == 1) {
+        if (g_RipDlg != nullptr && g_SideBar != nullptr) {
+            g_RipDlg->ApplyProfile(profile, g_SideBar->GetSelectedIndex());
+        }
+    } else if (g_MediaList != nullptr) {
         g_MediaList->ApplyProfile(profile);
     }
     if (g_SideBar == nullptr) {
@@ -231,12 +241,17 @@ std::vector<ParameterSet*> CAudioEncDlg::SelectedSets() {
     if (GetWorkMode() == 0 && g_MediaList != nullptr) {
         return g_MediaList->SelectedSets();
     }
+    if (GetWorkMode() == 1 && g_RipDlg != nullptr) {
+        return g_RipDlg->SelectedSets();
+    }
     return {};
 }
 
 void CAudioEncDlg::EditSets(const std::function<void()>& edit) {
     if (GetWorkMode() == 0 && g_MediaList != nullptr) {
         g_MediaList->EditSets(edit);
+    } else if (GetWorkMode() == 1 && g_RipDlg != nullptr) {
+        g_RipDlg->EditSets(edit);
     } else if (edit) {
         edit();
     }
@@ -245,6 +260,8 @@ void CAudioEncDlg::EditSets(const std::function<void()>& edit) {
 void CAudioEncDlg::SetSelectedVolume(int volume, bool firstOnly) {
     if (GetWorkMode() == 0 && g_MediaList != nullptr) {
         g_MediaList->SetSelectedVolume(volume, firstOnly);
+    } else if (GetWorkMode() == 1 && g_RipDlg != nullptr) {
+        g_RipDlg->SetSelectedVolume(volume);  // the rip list keeps the percent itself
     }
 }
 
@@ -272,6 +289,12 @@ double CAudioEncDlg::RunDoneSeconds() {
 double CAudioEncDlg::RunTotalSeconds() {
     return m_convert && m_convert->Driver() ? m_convert->Driver()->GetRunTotalSeconds() : 0.0;
 }
+
+bool CAudioEncDlg::IsRipRunActive() { return m_rip && m_rip->IsRunActive(); }
+
+double CAudioEncDlg::RipDoneSeconds() { return m_rip ? m_rip->DoneSeconds() : 0.0; }
+
+double CAudioEncDlg::RipTotalSeconds() { return m_rip ? m_rip->TotalSeconds() : 0.0; }
 
 std::string CAudioEncDlg::RunProgressText() {
     return m_convert ? m_convert->RunProgressText() : std::string();

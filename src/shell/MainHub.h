@@ -79,6 +79,11 @@ public:
     virtual double RunTotalSeconds() = 0;
     // The bar's words while a conversion run goes on ("12 of 40 files converted").
     virtual std::string RunProgressText() { return {}; }
+    // The rip run: whether a track is being ripped, the seconds done (finished tracks and the
+    // running one's position) and the seconds of the checked tracks.
+    virtual bool IsRipRunActive() { return false; }
+    virtual double RipDoneSeconds() { return 0; }
+    virtual double RipTotalSeconds() { return 0; }
 };
 
 // Set by the main dialog when it exists, cleared when it goes; the panels' tests set a fake.

@@ -76,6 +76,7 @@ public:
     void ToggleHeaderCheck(int column);
 
     void SetRowHeight(int height);
+    int RowHeight() const { return m_rowHeight; }
     void SetColours(const wxColour& text, const wxColour& background, const wxColour& disabled,
                     const wxColour& progress);
     void SetFontOfCells(const wxFont& font);
