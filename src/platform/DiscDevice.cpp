@@ -188,8 +188,8 @@ private:
 // FILE statement, though with a START in the track that length includes the gap before INDEX
 // 01. Such a gap shows as a pregap after the previous track's start; a PREGAP statement (gap
 // not taken from the file, lead-out right) shows as 0 and is left alone.
-int CorrectCdrdaoLeadOut(const CdIo_t* handle, track_t last, int leadOutLba) {
-    if (last < 2) {
+int CorrectCdrdaoLeadOut(const CdIo_t* handle, track_t first, track_t last, int leadOutLba) {
+    if (last <= first) {
         return leadOutLba;
     }
     const lsn_t gap = cdio_get_track_pregap_lsn(handle, last);
@@ -226,7 +226,7 @@ bool ReadTable(const CdIo_t* handle, bool cdrdao, DiscTable& table) {
     }
     int leadOut = cdio_get_track_lba(handle, CDIO_CDROM_LEADOUT_TRACK);
     if (cdrdao) {
-        leadOut = CorrectCdrdaoLeadOut(handle, last, leadOut);
+        leadOut = CorrectCdrdaoLeadOut(handle, first, last, leadOut);
     }
     if (leadOut == CDIO_INVALID_LBA || leadOut <= previousLba) {
         return false;
