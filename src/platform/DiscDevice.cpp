@@ -371,7 +371,9 @@ std::string_view Trim(std::string_view text) {
 
 }  // namespace
 
-std::unique_ptr<IDiscDevice> MakeDiscDevice() { return std::make_unique<CdioDiscDevice>(); }
+std::unique_ptr<IDiscDevice> MakeDiscDevice() {
+    return std::make_unique<CdioDiscDevice>();
+}
 
 std::vector<std::string> SplitImageList(std::string_view cdimages) {
     std::vector<std::string> images;

@@ -106,8 +106,9 @@ TEST(DiscDeviceTest, NinetyNineTrackTableReadsFast) {
         ASSERT_TRUE(device->ReadToc(image.cuePath, table));
     }
     const auto each = (std::chrono::steady_clock::now() - start) / kReads;
-    RecordProperty("microseconds_per_read",
-                   static_cast<int>(std::chrono::duration_cast<std::chrono::microseconds>(each).count()));
+    RecordProperty(
+        "microseconds_per_read",
+        static_cast<int>(std::chrono::duration_cast<std::chrono::microseconds>(each).count()));
     EXPECT_LT(each, std::chrono::milliseconds(200));
 }
 
@@ -193,7 +194,8 @@ TEST(DiscDeviceTest, TrayAndLockOnImagesAreRefusedAndHarmless) {
     test::TempDir dir;
     test::ImageOptions options;
     options.writeToc = true;
-    const DiscImage image = test::WriteDiscImage(dir.Path(), "disc", test::ThreeTrackSpecs(), options);
+    const DiscImage image =
+        test::WriteDiscImage(dir.Path(), "disc", test::ThreeTrackSpecs(), options);
     const auto device = MakeDiscDevice();
     for (const std::string& drive : {image.cuePath, image.tocPath, image.binPath}) {
         SCOPED_TRACE(drive);

@@ -16,7 +16,9 @@ namespace {
 
 using platform::DiscTable;
 
-DiscTable ThreeTracks() { return DiscTable{1, 3, {{1, false, 150}, {2, false, 9000}, {3, false, 20000}}, 30000}; }
+DiscTable ThreeTracks() {
+    return DiscTable{1, 3, {{1, false, 150}, {2, false, 9000}, {3, false, 20000}}, 30000};
+}
 
 class FakeDiscDevice final : public platform::IDiscDevice {
 public:
@@ -53,7 +55,8 @@ struct Panel {
                 listFilled = true;
             }
         }
-        const DriveWatcher::PollResult result = watcher.PollDrives(device, drives, selected, !listFilled);
+        const DriveWatcher::PollResult result =
+            watcher.PollDrives(device, drives, selected, !listFilled);
         timerRunning = timerRunning || result.startLoadTimer;
         if (result.emptySelected) {
             listFilled = false;
@@ -127,7 +130,8 @@ TEST(DriveWatcherTest, PollAfterALoadByHandReadsNothing) {
 // Real images as drives: a one-track image is passed over for the three-track one behind it.
 TEST(DriveWatcherTest, FirstAudioDiscAmongImages) {
     test::TempDir dir;
-    const auto single = test::WriteDiscImage(dir.Path(), "single", {test::TrackSpec{44100, 0, false, 0, 300.0, 4}});
+    const auto single =
+        test::WriteDiscImage(dir.Path(), "single", {test::TrackSpec{44100, 0, false, 0, 300.0, 4}});
     const auto three = test::WriteDiscImage(dir.Path(), "three", test::ThreeTrackSpecs(150));
     const auto device = platform::MakeDiscDevice();
     const std::vector<std::string> drives =

@@ -27,9 +27,9 @@ inline constexpr int kFramesPerSector = kSectorBytes / 4;
 inline constexpr int kLeadInSectors = 150;
 
 struct TrackSpec {
-    size_t frames = 0;      // audio sample frames; a data track uses dataSectors instead
-    int gapSectors = 0;     // silence before the track, marked INDEX 00
-    bool data = false;      // a MODE1/2352 data track
+    size_t frames = 0;   // audio sample frames; a data track uses dataSectors instead
+    int gapSectors = 0;  // silence before the track, marked INDEX 00
+    bool data = false;   // a MODE1/2352 data track
     int dataSectors = 0;
     double frequency = 440.0;
     std::uint32_t seed = 1;
@@ -38,10 +38,10 @@ struct TrackSpec {
 struct ImageTrack {
     int number = 0;
     bool data = false;
-    int gapLsn = -1;   // INDEX 00, -1 without a gap
-    int startLsn = 0;  // INDEX 01
-    int sectors = 0;   // from INDEX 01 to the end of the track's own sectors, padding included
-    Pcm pcm;           // exactly the audio generated, without padding; empty for a data track
+    int gapLsn = -1;        // INDEX 00, -1 without a gap
+    int startLsn = 0;       // INDEX 01
+    int sectors = 0;        // from INDEX 01 to the end of the track's own sectors, padding included
+    Pcm pcm;                // exactly the audio generated, without padding; empty for a data track
     std::string dataBytes;  // the sectors of a data track
     int StartLba() const { return startLsn + kLeadInSectors; }
 };
@@ -78,7 +78,8 @@ inline Pcm MakeSineAndNoise(size_t frames, double frequency, std::uint32_t seed)
     pcm.samples.resize(frames * 2);
     std::uint32_t state = seed * 2654435761u + 12345u;
     for (size_t i = 0; i < frames; ++i) {
-        const double angle = 2.0 * 3.14159265358979323846 * frequency * static_cast<double>(i) / 44100.0;
+        const double angle =
+            2.0 * 3.14159265358979323846 * frequency * static_cast<double>(i) / 44100.0;
         pcm.samples[2 * i] = static_cast<std::int16_t>(std::lround(12000.0 * std::sin(angle)));
         state = state * 1664525u + 1013904223u;
         pcm.samples[2 * i + 1] = static_cast<std::int16_t>(static_cast<int>(state >> 16) - 32768);
@@ -150,11 +151,13 @@ inline DiscImage WriteDiscImage(const std::string& folder, const std::string& na
             bin += track.dataBytes;
         } else {
             track.pcm = MakeSineAndNoise(spec.frames, spec.frequency, spec.seed);
-            track.sectors = static_cast<int>((spec.frames + kFramesPerSector - 1) / kFramesPerSector);
+            track.sectors =
+                static_cast<int>((spec.frames + kFramesPerSector - 1) / kFramesPerSector);
             bin.append(reinterpret_cast<const char*>(track.pcm.samples.data()),
                        track.pcm.samples.size() * 2);
-            bin.append(static_cast<size_t>(track.sectors) * kSectorBytes - track.pcm.samples.size() * 2,
-                       '\0');
+            bin.append(
+                static_cast<size_t>(track.sectors) * kSectorBytes - track.pcm.samples.size() * 2,
+                '\0');
         }
         lsn += track.sectors;
         image.tracks.push_back(std::move(track));
@@ -191,7 +194,8 @@ inline DiscImage WriteDiscImage(const std::string& folder, const std::string& na
 // sectors (the first and last not whole). Without gaps the disc id is 0e001003; with gaps of
 // 150 sectors before tracks 2 and 3 it is 14001403.
 inline std::vector<TrackSpec> ThreeTrackSpecs(int gapSectors = 0) {
-    return {TrackSpec{220632, 0, false, 0, 440.0, 1}, TrackSpec{308700, gapSectors, false, 0, 660.0, 2},
+    return {TrackSpec{220632, 0, false, 0, 440.0, 1},
+            TrackSpec{308700, gapSectors, false, 0, 660.0, 2},
             TrackSpec{176841, gapSectors, false, 0, 880.0, 3}};
 }
 
@@ -199,8 +203,8 @@ inline std::vector<TrackSpec> ThreeTrackSpecs(int gapSectors = 0) {
 inline std::vector<TrackSpec> ManyTrackSpecs(int count) {
     std::vector<TrackSpec> specs;
     for (int i = 0; i < count; ++i) {
-        specs.push_back(TrackSpec{static_cast<size_t>(2 * kFramesPerSector + 37 * (i + 1)), 0, false, 0,
-                                  220.0 + 10.0 * i, static_cast<std::uint32_t>(100 + i)});
+        specs.push_back(TrackSpec{static_cast<size_t>(2 * kFramesPerSector + 37 * (i + 1)), 0,
+                                  false, 0, 220.0 + 10.0 * i, static_cast<std::uint32_t>(100 + i)});
     }
     return specs;
 }
