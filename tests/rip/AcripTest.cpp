@@ -38,7 +38,8 @@ bool Contains(const std::string& text, const std::string& part) {
 std::vector<std::string> FilesBelow(const std::string& folder) {
     std::vector<std::string> files;
     std::error_code error;
-    for (fs::recursive_directory_iterator it(folder, error), end; !error && it != end; it.increment(error)) {
+    for (fs::recursive_directory_iterator it(folder, error), end; !error && it != end;
+         it.increment(error)) {
         if (it->is_regular_file())
             files.push_back(fs::relative(it->path(), folder).string());
     }
@@ -57,7 +58,8 @@ public:
         posix_spawn_file_actions_t actions;
         posix_spawn_file_actions_init(&actions);
         posix_spawn_file_actions_addopen(&actions, 0, "/dev/null", O_RDONLY, 0);
-        posix_spawn_file_actions_addopen(&actions, 1, logPath.c_str(), O_WRONLY | O_CREAT | O_TRUNC, 0644);
+        posix_spawn_file_actions_addopen(&actions, 1, logPath.c_str(), O_WRONLY | O_CREAT | O_TRUNC,
+                                         0644);
         posix_spawn_file_actions_adddup2(&actions, 1, 2);
         if (posix_spawn(&m_pid, kAcrip.c_str(), &actions, nullptr, argv.data(), environ) != 0)
             m_pid = -1;
@@ -107,19 +109,24 @@ protected:
     void TearDown() override { ::unsetenv("AC_CTT_PATH"); }
 
     void SetString(const char* name, const std::string& value) {
-        platform::SettingsStore(dir / "config/audio-converter/settings.ini").WriteString(kSettingsKey, name, value);
+        platform::SettingsStore(dir / "config/audio-converter/settings.ini")
+            .WriteString(kSettingsKey, name, value);
     }
     void SetInt(const char* name, int value) {
-        platform::SettingsStore(dir / "config/audio-converter/settings.ini").WriteInt(kSettingsKey, name, value);
+        platform::SettingsStore(dir / "config/audio-converter/settings.ini")
+            .WriteInt(kSettingsKey, name, value);
     }
-    test::ToolResult Acrip(const std::vector<std::string>& args) { return test::RunTool(kAcrip, args, 120); }
+    test::ToolResult Acrip(const std::vector<std::string>& args) {
+        return test::RunTool(kAcrip, args, 120);
+    }
 
     // The samples of a ripped file, decoded by the ffmpeg command for anything but WAV.
     test::Pcm Decoded(const std::string& path) {
         std::string wav = path;
         if (!path.ends_with(".wav")) {
             wav = dir / "decoded.wav";
-            EXPECT_TRUE(test::RunFfmpeg("-i \"" + path + "\" -c:a pcm_s16le \"" + wav + "\"")) << path;
+            EXPECT_TRUE(test::RunFfmpeg("-i \"" + path + "\" -c:a pcm_s16le \"" + wav + "\""))
+                << path;
         }
         test::Pcm pcm;
         EXPECT_TRUE(test::ReadWav(wav, pcm)) << path;
@@ -138,31 +145,38 @@ TEST_F(AcripTest, ListShowsTheDiscIdTracksAndRecordOfTheFirstImageThatHoldsADisc
     EXPECT_EQ(list.err, "") << "libcdio must print nothing";
     EXPECT_TRUE(Contains(list.out, "Drive:   " + image.cuePath + "\n")) << list.out;
     EXPECT_TRUE(Contains(list.out, "Disc id: 0e001003\n")) << list.out;
-    EXPECT_TRUE(Contains(list.out, "Artist:  The Testers\nAlbum:   Test Album\nYear:    2004\n"
-                                   "Genre:   rock\n")) << list.out;
-    EXPECT_TRUE(Contains(list.out, "  1  00:05  First Light\n  2  00:07  Second\n  3  00:04  Third\n"))
+    EXPECT_TRUE(Contains(list.out,
+                         "Artist:  The Testers\nAlbum:   Test Album\nYear:    2004\n"
+                         "Genre:   rock\n"))
+        << list.out;
+    EXPECT_TRUE(
+        Contains(list.out, "  1  00:05  First Light\n  2  00:07  Second\n  3  00:04  Third\n"))
         << list.out;
 
     // A disc without a record: default names, and where the record would be. A track runs to
     // the next track's start, so the gaps count to the tracks before them.
-    const test::DiscImage gapped = test::WriteDiscImage(dir.Path(), "gapped", test::ThreeTrackSpecs(150));
+    const test::DiscImage gapped =
+        test::WriteDiscImage(dir.Path(), "gapped", test::ThreeTrackSpecs(150));
     const test::ToolResult unknown = Acrip({"--device", gapped.cuePath, "--list"});
     EXPECT_EQ(unknown.exitCode, 0) << unknown.err;
     EXPECT_TRUE(Contains(unknown.out, "Disc id: 14001403\n")) << unknown.out;
-    EXPECT_TRUE(Contains(unknown.out, "Record:  none (" + dir / "records/14001403.cddb)")) << unknown.out;
-    EXPECT_TRUE(Contains(unknown.out, "  1  00:07  Track01\n  2  00:09  Track02\n  3  00:04  Track03\n"))
+    EXPECT_TRUE(Contains(unknown.out, "Record:  none (" + dir / "records/14001403.cddb)"))
+        << unknown.out;
+    EXPECT_TRUE(
+        Contains(unknown.out, "  1  00:07  Track01\n  2  00:09  Track02\n  3  00:04  Track03\n"))
         << unknown.out;
 }
 
 TEST_F(AcripTest, AskedTracksRipSampleExactToWavAndFlacIntoArtistAndAlbumFolders) {
     const std::string folder = "The Testers/Test Album/";
-    const test::ToolResult wav =
-        Acrip({"--device", image.cuePath, "--tracks", "1,3", "--profile", "wav", "--out", dir / "wav"});
+    const test::ToolResult wav = Acrip(
+        {"--device", image.cuePath, "--tracks", "1,3", "--profile", "wav", "--out", dir / "wav"});
     ASSERT_EQ(wav.exitCode, 0) << wav.out << wav.err;
     EXPECT_TRUE(Contains(wav.out, "2 of 2 tracks ripped")) << wav.out;
     // Track 3 keeps its number though track 2 was not asked for.
-    ASSERT_EQ(FilesBelow(dir / "wav"), (std::vector<std::string>{folder + "01-The Testers-First Light.wav",
-                                                                 folder + "03-The Testers-Third.wav"}));
+    ASSERT_EQ(FilesBelow(dir / "wav"),
+              (std::vector<std::string>{folder + "01-The Testers-First Light.wav",
+                                        folder + "03-The Testers-Third.wav"}));
     EXPECT_EQ(Decoded(dir / "wav/" + folder + "01-The Testers-First Light.wav").samples,
               test::PaddedPcm(image.tracks[0]).samples);
     EXPECT_EQ(Decoded(dir / "wav/" + folder + "03-The Testers-Third.wav").samples,
@@ -171,18 +185,20 @@ TEST_F(AcripTest, AskedTracksRipSampleExactToWavAndFlacIntoArtistAndAlbumFolders
     // Without --out the setting OutputCDDir decides.
     SetString("OutputCDDir", dir / "flac");
     fs::create_directories(dir / "flac");
-    const test::ToolResult flac = Acrip({"--device", image.cuePath, "--tracks", "3,1", "--profile", "flac"});
+    const test::ToolResult flac =
+        Acrip({"--device", image.cuePath, "--tracks", "3,1", "--profile", "flac"});
     ASSERT_EQ(flac.exitCode, 0) << flac.out << flac.err;
-    ASSERT_EQ(FilesBelow(dir / "flac"), (std::vector<std::string>{folder + "01-The Testers-First Light.flac",
-                                                                  folder + "03-The Testers-Third.flac"}));
+    ASSERT_EQ(FilesBelow(dir / "flac"),
+              (std::vector<std::string>{folder + "01-The Testers-First Light.flac",
+                                        folder + "03-The Testers-Third.flac"}));
     EXPECT_EQ(Decoded(dir / "flac/" + folder + "01-The Testers-First Light.flac").samples,
               test::PaddedPcm(image.tracks[0]).samples);
     EXPECT_EQ(Decoded(dir / "flac/" + folder + "03-The Testers-Third.flac").samples,
               test::PaddedPcm(image.tracks[2]).samples);
 
     // A .toc names its .bin relative to itself; the reader must find it from anywhere.
-    const test::ToolResult toc =
-        Acrip({"--device", image.tocPath, "--tracks", "2", "--profile", "wav", "--out", dir / "toc"});
+    const test::ToolResult toc = Acrip(
+        {"--device", image.tocPath, "--tracks", "2", "--profile", "wav", "--out", dir / "toc"});
     ASSERT_EQ(toc.exitCode, 0) << toc.out << toc.err;
     EXPECT_EQ(Decoded(dir / "toc/" + folder + "02-The Testers-Second.wav").samples,
               test::PaddedPcm(image.tracks[1]).samples);
@@ -191,11 +207,14 @@ TEST_F(AcripTest, AskedTracksRipSampleExactToWavAndFlacIntoArtistAndAlbumFolders
 // Stopped by SIGTERM or Ctrl-C in the middle of a long track: the tool ends, nothing stays
 // under a final name and no part file is left.
 TEST_F(AcripTest, AStoppedRipLeavesNoFileAndExits130) {
-    const test::DiscImage longDisc = test::WriteDiscImage(
-        dir.Path(), "long", {test::TrackSpec{44100 * 240, 0, false, 0, 440.0, 7}, test::TrackSpec{44100, 0, false, 0, 220.0, 8}});
+    const test::DiscImage longDisc =
+        test::WriteDiscImage(dir.Path(), "long",
+                             {test::TrackSpec{44100 * 240, 0, false, 0, 440.0, 7},
+                              test::TrackSpec{44100, 0, false, 0, 220.0, 8}});
     for (int signal : {SIGTERM, SIGINT}) {
         const std::string out = dir / ("out" + std::to_string(signal));
-        RunningAcrip acrip({"--device", longDisc.cuePath, "--profile", "mp3", "--out", out}, dir / "log");
+        RunningAcrip acrip({"--device", longDisc.cuePath, "--profile", "mp3", "--out", out},
+                           dir / "log");
         ASSERT_GT(acrip.Pid(), 0);
         int writer = 0;
         for (int i = 0; i < 3000 && writer == 0; ++i) {
@@ -219,11 +238,13 @@ TEST_F(AcripTest, AStoppedRipLeavesNoFileAndExits130) {
 TEST_F(AcripTest, AFailedTrackSaysWhyAndTheOthersStillRip) {
     const std::string tool = dir / "fake-ctt";
     std::ofstream(tool) << "#!/bin/sh\nfor last; do :; done\n"
-                           "case \"$*\" in *Track02.cda*) echo '|Error>>> cannot read sector 42' >&2; exit 1;; esac\n"
+                           "case \"$*\" in *Track02.cda*) echo '|Error>>> cannot read sector 42' "
+                           ">&2; exit 1;; esac\n"
                            "echo '|Time>>> 1'; printf audio > \"$last\"\n";
     ::chmod(tool.c_str(), 0755);
     ::setenv("AC_CTT_PATH", tool.c_str(), 1);
-    const test::ToolResult run = Acrip({"--device", image.cuePath, "--profile", "wav", "--out", dir / "out"});
+    const test::ToolResult run =
+        Acrip({"--device", image.cuePath, "--profile", "wav", "--out", dir / "out"});
     EXPECT_EQ(run.exitCode, 1) << run.out << run.err;
     EXPECT_TRUE(Contains(run.out, "FAILED: 02 Second")) << run.out;
     EXPECT_TRUE(Contains(run.err, "    cannot read sector 42\n")) << run.err;
@@ -247,10 +268,12 @@ TEST_F(AcripTest, UsageErrorsAndDiscsThatCannotBeRippedExit2WithAReason) {
         {{"--device", image.cuePath, "--tracks", "9"}, "track 9 is not an audio track of the disc"},
         {{"--device", image.cuePath, "--tracks", "1,x"}, "--tracks 1,x: not a list of tracks"},
         {{"--device", image.cuePath, "--tracks", "3-1"}, "--tracks 3-1: not a list of tracks"},
-        {{"--device", dir / "lost.cue"}, "the image's audio file " + dir / "lost.bin" + " is missing"},
+        {{"--device", dir / "lost.cue"},
+         "the image's audio file " + dir / "lost.bin" + " is missing"},
         {{"--device", dir / "nowhere.cue"}, "no such drive or disc image"},
         {{"--device", dir / "records/0e001003.cddb"}, "holds no audio disc"},
-        {{"--device", image.cuePath, "--profile", "no such profile"}, "no profile named no such profile"},
+        {{"--device", image.cuePath, "--profile", "no such profile"},
+         "no profile named no such profile"},
         {{"--server", "localhost"}, "unknown option --server"},
         {{"--out"}, "--out needs a value"},
     };
@@ -259,7 +282,8 @@ TEST_F(AcripTest, UsageErrorsAndDiscsThatCannotBeRippedExit2WithAReason) {
         EXPECT_EQ(run.exitCode, 2) << c.reason << "\n" << run.out << run.err;
         EXPECT_TRUE(Contains(run.err, c.reason)) << run.err;
     }
-    EXPECT_TRUE(Contains(Acrip({"--device", image.cuePath, "--tracks", "9"}).err, "(audio tracks: 1-3)"));
+    EXPECT_TRUE(
+        Contains(Acrip({"--device", image.cuePath, "--tracks", "9"}).err, "(audio tracks: 1-3)"));
 }
 
 }  // namespace

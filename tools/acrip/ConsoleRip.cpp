@@ -23,10 +23,14 @@ bool HasEnded(RipStatus status) {
 
 const char* StatusWord(RipStatus status) {
     switch (status) {
-        case RipStatus::Completed: return "done";
-        case RipStatus::Failed: return "FAILED";
-        case RipStatus::Aborted: return "stopped";
-        default: return "";
+        case RipStatus::Completed:
+            return "done";
+        case RipStatus::Failed:
+            return "FAILED";
+        case RipStatus::Aborted:
+            return "stopped";
+        default:
+            return "";
     }
 }
 
@@ -164,13 +168,14 @@ std::string ConsoleRip::RowName(int row) const {
 }
 
 int ConsoleRip::CountOf(RipStatus status) const {
-    return static_cast<int>(std::count_if(m_rows.begin(), m_rows.end(),
-                                          [status](const RipRow& row) { return row.status == status; }));
+    return static_cast<int>(
+        std::count_if(m_rows.begin(), m_rows.end(),
+                      [status](const RipRow& row) { return row.status == status; }));
 }
 
 int ConsoleRip::CheckedCount() const {
-    return static_cast<int>(std::count_if(m_rows.begin(), m_rows.end(),
-                                          [](const RipRow& row) { return row.checked; }));
+    return static_cast<int>(
+        std::count_if(m_rows.begin(), m_rows.end(), [](const RipRow& row) { return row.checked; }));
 }
 
 // By seconds of audio, so a long track weighs what it takes.

@@ -74,7 +74,8 @@ void Help(const std::string& base) {
         "\nRips the audio tracks of a CD, or of a disc image, into files with the program's own\n"
         "profiles, naming scheme and settings. Names come from the disc's record in the local\n"
         "disc record folder (setting localcddb) when there is one.\n\n"
-        "  --device DEV         a drive (/dev/sr0) or a disc image (.cue beside its .bin, or .toc);\n"
+        "  --device DEV         a drive (/dev/sr0) or a disc image (.cue beside its .bin, or "
+        ".toc);\n"
         "                       default: the first drive, then the first image of the setting\n"
         "                       cdimages, that holds an audio disc\n"
         "  --profile NAME|PATH  a profile by file name or shown name, or a .pf file (default mp3)\n"
@@ -210,8 +211,10 @@ bool FindDisc(platform::IDiscDevice& device, const Options& options, AppConfig& 
     const int index = FindFirstAudioDisc(device, drives, disc.table);
     if (index < 0) {
         if (drives.empty()) {
-            std::fputs("acrip: no drive found and no disc image in the setting cdimages; name one "
-                       "with --device\n", stderr);
+            std::fputs(
+                "acrip: no drive found and no disc image in the setting cdimages; name one "
+                "with --device\n",
+                stderr);
         } else {
             std::string names;
             for (const std::string& drive : drives)
@@ -244,8 +247,8 @@ void PrintTable(const Disc& disc, std::uint32_t discId, const std::vector<TrackR
 
 // The output folder as given or set: made when missing; the driver only makes artist and album.
 bool PrepareOutputFolder(const Options& options, AppConfig& config, std::string& folder) {
-    folder = options.outputDirectory.empty() ? config.GetString("OutputCDDir")
-                                             : options.outputDirectory;
+    folder =
+        options.outputDirectory.empty() ? config.GetString("OutputCDDir") : options.outputDirectory;
     folder = fs::absolute(folder).lexically_normal().string();
     std::error_code error;
     if (fs::exists(folder, error) && !fs::is_directory(folder, error)) {
@@ -302,7 +305,8 @@ int main(int argc, char** argv) {
     const std::string recordFolder = cddb::LocalCddbFolder(config.GetString("localcddb"));
     cddb::CDDiscInfo record;
     const bool known = cddb::LoadDiscFile(recordFolder, discId, record);
-    const std::vector<TrackRow> rows = BuildTrackRows(disc.table, disc.drive, known ? &record : nullptr);
+    const std::vector<TrackRow> rows =
+        BuildTrackRows(disc.table, disc.drive, known ? &record : nullptr);
     if (options.list) {
         PrintTable(disc, discId, rows, known ? &record : nullptr, recordFolder);
         return 0;
@@ -313,9 +317,10 @@ int main(int argc, char** argv) {
         numbers.push_back(row.number);
     for (int wanted : options.tracks) {
         if (std::find(numbers.begin(), numbers.end(), wanted) == numbers.end()) {
-            std::fprintf(stderr, "acrip: track %d is not an audio track of the disc in %s "
-                         "(audio tracks: %s)\n", wanted, disc.drive.c_str(),
-                         RangesText(numbers).c_str());
+            std::fprintf(stderr,
+                         "acrip: track %d is not an audio track of the disc in %s "
+                         "(audio tracks: %s)\n",
+                         wanted, disc.drive.c_str(), RangesText(numbers).c_str());
             return kUsageError;
         }
     }
