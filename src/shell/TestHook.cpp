@@ -1,5 +1,7 @@
 #include "shell/TestHook.h"
 
+#include "rip/ui/RipPanel.h"
+
 #include "shell/AudioEncDlg.h"
 
 #include "convert/RowParameters.h"
@@ -162,6 +164,24 @@ void CTestHook::DescribePanels(const CAudioEncDlg& dlg, std::ostream& out) {
             }
         }
     }
+    if (g_RipDlg != nullptr) {
+        // Tab-separated like the conversion rows: name, track, duration, target, status text,
+        // checked, selected, source.
+        std::istringstream rows(g_RipDlg->DescribeRows());
+        std::string row;
+        for (int index = 0; std::getline(rows, row); ++index) {
+            std::replace(row.begin(), row.end(), '|', '\t');
+            out << "riprow" << index << "=" << row.substr(4) << "\n";
+        }
+        const std::vector<std::string> drives = g_RipDlg->Drives();
+        const int current = g_RipDlg->CurrentDrive();
+        out << "ripdrive=" << (current >= 0 && current < static_cast<int>(drives.size()) ? drives[std::size_t(current)] : "")
+            << "\n";
+        out << "ripdrives=" << drives.size() << "\n";
+        out << "ripboxes=" << g_RipDlg->DescribeBoxes() << "\n";
+        out << "riprunning=" << (g_RipDlg->Driver().IsRunning() ? 1 : 0) << "\n";
+        out << "ripdiscid=" << std::hex << g_RipDlg->DiscId() << std::dec << "\n";
+    }
     if (g_OutputPanel != nullptr) {
         out << "outdir=" << g_OutputPanel->GetOutputDirectory() << "\n";
     }
@@ -268,6 +288,24 @@ void CTestHook::RunScriptCommand(CAudioEncDlg& dlg, const std::string& line) {
         int index = 0;
         in >> index;
         g_SideBar->SelectIndex(index, true);
+    } else if (verb == "ripimage" && g_RipDlg != nullptr) {
+        g_RipDlg->AddDiscImagePath(rest);
+    } else if (verb == "ripbox" && g_RipDlg != nullptr) {
+        int box = 0;
+        in >> box;
+        std::string text;
+        std::getline(in >> std::ws, text);
+        g_RipDlg->TypeInBox(box, text);
+    } else if (verb == "riprename" && g_RipDlg != nullptr) {
+        int row = 0;
+        in >> row;
+        std::string text;
+        std::getline(in >> std::ws, text);
+        g_RipDlg->RenameRow(row, text);
+    } else if (verb == "ripclick" && g_RipDlg != nullptr) {
+        int row = 0;
+        in >> row;
+        g_RipDlg->ClickRow(row);
     } else if (verb == "tab") {
         int mode = 0;
         in >> mode;

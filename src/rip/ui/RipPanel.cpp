@@ -400,8 +400,14 @@ bool CDRipDlg::IsCommandEnabled(int commandId) {
 bool CDRipDlg::OnCommand(int commandId) {
     if (!IsCommandEnabled(commandId)) return false;
     switch (commandId) {
-        case ripcmd::kRipChecked: m_driver.RipNextTrack(); return true;
-        case ripcmd::kRipSelected: m_driver.RipSelected(); return true;
+        case ripcmd::kRipChecked:
+            if (!m_driver.IsRunning()) RefreshDriverSettings();
+            m_driver.RipNextTrack();
+            return true;
+        case ripcmd::kRipSelected:
+            RefreshDriverSettings();
+            m_driver.RipSelected();
+            return true;
         case ripcmd::kPauseChecked: m_driver.PauseRip(); return true;
         case ripcmd::kStopChecked: m_driver.StopRip(); return true;
         case ripcmd::kPauseSelected: m_driver.PauseSelected(); return true;
@@ -434,6 +440,18 @@ bool CDRipDlg::OnCommand(int commandId) {
         return true;
     }
     return false;
+}
+
+void CDRipDlg::RefreshDriverSettings() {
+    // Read at the start of every run, so the preferences and the output panel count at once.
+    AppConfig& config = GetAppConfig();
+    RipSettings settings;
+    settings.outputDirectory = config.GetString("OutputCDDir");
+    settings.ejectCd = config.GetInt("ejectcd") != 0;
+    settings.naming = ReadNamingSettings(config);
+    settings.toolPath = platform::FindConversionTool();
+    settings.toolDirectory = wxFileName(wxString::FromUTF8(settings.toolPath)).GetPath().utf8_string();
+    m_driver.SetSettings(std::move(settings));
 }
 
 bool CDRipDlg::StopForClose() {

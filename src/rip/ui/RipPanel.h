@@ -147,6 +147,12 @@ public:
     bool Renamed() const { return m_renamed; }
     void BeginRename();
     XListCtrl* List() const { return m_list; }
+    // What a user does with the keyboard, for the window tests: a box typed and left, a name
+    // typed in place and Enter, a row clicked.
+    void TypeInBox(int box, const std::string& text);
+    void RenameRow(int row, const std::string& text);
+    void ClickRow(int row);
+    std::string DescribeBoxes() const;
 
     // ---- IRipList ----
     int RowCount() override;
@@ -206,6 +212,7 @@ private:
     void ConfigureToAll();
     void FitColumns();
     void JoinWorker();
+    void RefreshDriverSettings();
 
     std::unique_ptr<platform::IDiscDevice> m_device;
     IRipModeHost* m_modeHost = nullptr;

@@ -501,3 +501,34 @@ void CDRipDlg::RecalcLayout() {
 }
 
 }  // namespace ac
+
+namespace ac {
+
+void CDRipDlg::TypeInBox(int box, const std::string& text) {
+    if (box < 0 || box >= static_cast<int>(m_boxes.size())) return;
+    m_boxes[std::size_t(box)]->ChangeValue(wxString::FromUTF8(text));
+    OnBoxKillFocus(m_boxes[std::size_t(box)]);
+}
+
+void CDRipDlg::RenameRow(int row, const std::string& text) {
+    ClickRow(row);
+    BeginRename();
+    if (!m_renameEdit->IsShown()) return;
+    m_renameEdit->ChangeValue(wxString::FromUTF8(text));
+    m_lastRenameEnterMs = 0;
+    CommitRename(false);
+}
+
+void CDRipDlg::ClickRow(int row) {
+    m_list->SelectRow(row, true);
+    SyncSelection();
+}
+
+std::string CDRipDlg::DescribeBoxes() const {
+    std::string out;
+    for (wxTextCtrl* box : m_boxes) out += box->GetValue().utf8_string() + "|";
+    out += "record=" + m_record.artist + "|" + m_record.album + "|" + m_record.genre + "|" + m_record.year;
+    return out;
+}
+
+}  // namespace ac
