@@ -11,17 +11,29 @@
 #include <unistd.h>
 
 #include <cstdint>
+#include <filesystem>
 #include <string>
 
 namespace {
 
-// tmpfs where there is one: every save syncs its file and folder.
-std::string FuzzFolder() {
-    std::string pattern =
-        access("/dev/shm", W_OK) == 0 ? "/dev/shm/ac-fuzz-cddb-XXXXXX" : "/tmp/ac-fuzz-cddb-XXXXXX";
-    const char* made = ::mkdtemp(pattern.data());
-    return made ? made : "";
-}
+// tmpfs where there is one: every save syncs its file and folder. Removed when the run ends.
+class FuzzFolder {
+public:
+    FuzzFolder() {
+        std::string pattern = access("/dev/shm", W_OK) == 0 ? "/dev/shm/ac-fuzz-cddb-XXXXXX"
+                                                            : "/tmp/ac-fuzz-cddb-XXXXXX";
+        const char* made = ::mkdtemp(pattern.data());
+        m_path = made ? made : "";
+    }
+    ~FuzzFolder() {
+        std::error_code ignored;
+        std::filesystem::remove_all(m_path, ignored);
+    }
+    const std::string& Path() const { return m_path; }
+
+private:
+    std::string m_path;
+};
 
 bool Same(const cddb::CDDiscInfo& a, const cddb::CDDiscInfo& b) {
     return a.artist == b.artist && a.album == b.album && a.genre == b.genre && a.year == b.year &&
@@ -35,9 +47,11 @@ bool IsCleanText(const std::string& text, std::size_t capacity) {
 }  // namespace
 
 extern "C" int LLVMFuzzerTestOneInput(const std::uint8_t* bytes, std::size_t size) {
-    static const std::string folder = FuzzFolder();
-    if (folder.empty())
+    static const FuzzFolder fuzzFolder;
+    const std::string& folder = fuzzFolder.Path();
+    if (folder.empty()) {
         return 0;
+    }
     FuzzedDataProvider data(bytes, size);
     const int format =
         data.ConsumeBool() ? cddb::kUnixDiscFileFormat : cddb::kWindowsDiscFileFormat;
