@@ -56,6 +56,7 @@ constexpr std::array kKeys = {
     I("cddborder", 0, "order of CDDB sources"),
     I("ejectcd", 0, "eject the disc when a rip is done"),
     I("lockcd", 0, "preference shown and stored; ripping always locks the tray"),
+    S("cdimages", "", "disc images listed as drives after the devices, separated by ';'"),
 };
 
 }  // namespace
@@ -118,8 +119,11 @@ int AppConfig::GetInt(const char* name, const char* subkey, int defaultValue) {
 std::string AppConfig::GetString(const char* name, const char* subkey, const char* defaultValue) {
     const char* fallback = defaultValue ? defaultValue : "";
     auto value = m_store.Read(KeyPath(subkey), name);
+    // The old fixed buffers hold 260 bytes; the list of disc images is our own and holds as many
+    // paths as the user adds.
+    const bool limited = std::strcmp(name, "cdimages") != 0;
     if (!value || value->type != platform::SettingType::String ||
-        value->text.size() + 1 > kStringBufferSize) {
+        (limited && value->text.size() + 1 > kStringBufferSize)) {
         SetString(name, fallback, subkey);
         return fallback;
     }

@@ -51,6 +51,12 @@ TEST_F(AppConfigTest, AStringMustFitTheBufferWithItsTerminatingNul) {
     ASSERT_TRUE(config.SetString("last_openpath", tooLong.c_str()));
     EXPECT_EQ(config.GetString("last_openpath", nullptr, "dflt"), "dflt");
     EXPECT_EQ(raw.Read(settingsKey, "last_openpath")->text, "dflt");
+
+    // The disc images are a list of paths that may grow past any one buffer: never cut.
+    std::string images;
+    for (int i = 0; i < 20; ++i) images += "/home/me/Music/Images/Some Album " + std::to_string(i) + "/disc.cue;";
+    ASSERT_TRUE(config.SetString("cdimages", images.c_str()));
+    EXPECT_EQ(config.GetString("cdimages"), images);
 }
 
 TEST_F(AppConfigTest, SubkeysLieBelowTheSettingsKey) {
