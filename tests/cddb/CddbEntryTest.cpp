@@ -131,15 +131,11 @@ const CorpusCase kCorpus[] = {
 INSTANTIATE_TEST_SUITE_P(Corpus, CorpusEntry, testing::ValuesIn(kCorpus));
 
 TEST(CddbEntryTest, EveryCorpusFileIsInTheTable) {
-    std::size_t files = 0;
-    for (const char* folder : {"xmcd", "cddb"}) {
-        for (const auto& file :
-             std::filesystem::directory_iterator(std::string(AC_CORPUS_DIR) + "/" + folder)) {
-            (void)file;
-            ++files;
-        }
-    }
-    EXPECT_EQ(files, std::size(kCorpus));
+    const std::string corpus = AC_CORPUS_DIR;
+    using std::filesystem::directory_iterator;
+    EXPECT_EQ(std::distance(directory_iterator(corpus + "/xmcd"), directory_iterator()) +
+                  std::distance(directory_iterator(corpus + "/cddb"), directory_iterator()),
+              std::ssize(kCorpus));
 }
 
 TEST(CddbEntryTest, FieldsOfTheCommentBlockAndDiscId) {
@@ -275,23 +271,6 @@ TEST(CddbEntryTest, CutOffEntriesFailOnlyWhereARequiredLineIsMissing) {
             EXPECT_NE(result, EntryResult::Ok) << "cut at " << cut;
         }
     }
-}
-
-TEST(CddbEntryTest, DiscInfoKeepsTheRecordsCapacities) {
-    std::string tail = "DTITLE=" + std::string(300, 'a') + " / B\n";
-    for (int track = 0; track < 120; ++track) {
-        tail += "TTITLE" + std::to_string(track) + "=" + std::string(300, 'x') + "\n";
-    }
-    tail += "EXTD=YEAR: " + std::string(50, '9') + "\n";
-    CddbEntry entry;
-    ASSERT_EQ(cddb::ParseEntry(Reply(tail), entry), EntryResult::Ok);
-    CDDiscInfo info;
-    cddb::EntryToDiscInfo("misc", entry, info);
-    EXPECT_EQ(info.trackCount, 99);
-    EXPECT_EQ(info.titles.size(), 99u);
-    EXPECT_EQ(info.artist.size(), 99u);
-    EXPECT_EQ(info.Title(98).size(), 259u);
-    EXPECT_EQ(info.year.size(), 29u);
 }
 
 }  // namespace

@@ -1,6 +1,5 @@
 #include "cddb/DiscFile.h"
 
-#include "cddb/CddbEntry.h"
 #include "support/TempDir.h"
 
 #include <gtest/gtest.h>
@@ -188,22 +187,6 @@ TEST(DiscFileTest, HugeTruncatedAndDamagedFilesGiveARecord) {
     std::filesystem::remove(path);
     std::filesystem::create_directory(path);
     EXPECT_FALSE(cddb::LoadDiscFile(folder.Path(), 1, info));
-}
-
-TEST(DiscFileTest, LookupRecordSurvivesTheCache) {
-    std::ifstream in(std::string(AC_CORPUS_DIR) + "/cddb/cddbscala_read_210_misc_2f0d8939.txt",
-                     std::ios::binary);
-    std::ostringstream reply;
-    reply << in.rdbuf();
-    cddb::CddbEntry entry;
-    ASSERT_EQ(cddb::ParseEntry(reply.str(), entry), cddb::EntryResult::Ok);
-    CDDiscInfo info;
-    cddb::EntryToDiscInfo("misc", entry, info);
-    ac::test::TempDir folder;
-    ASSERT_TRUE(cddb::SaveDiscFile(folder.Path(), cddb::FormatDiscId(entry.discId), info, 1));
-    CDDiscInfo loaded;
-    ASSERT_TRUE(cddb::LoadDiscFile(folder.Path(), 0x2f0d8939, loaded));
-    ExpectSameRecord(loaded, info);
 }
 
 TEST(DiscFileTest, LocalFolderDefaultsToTheUserDataFolderAndIsCreated) {

@@ -44,15 +44,4 @@ TEST(PrivateProfileTest, NulBytesEndLinesAndOtherCodePagesBecomeUtf8) {
     EXPECT_EQ(profile.GetString("CDINFO", "ALBUM"), "Once");
 }
 
-TEST(PrivateProfileTest, WriterKeepsEveryValueOnItsLine) {
-    cddb::PrivateProfileWriter writer;
-    writer.Section("MUSIC");
-    writer.Key("Track00", std::string("one\ntwo\rthree\0four", 18));
-    writer.Key("Track01", "  padded\t");
-    EXPECT_EQ(writer.Text(), "[MUSIC]\r\nTrack00=one two three four\r\nTrack01=  padded\t\r\n");
-    PrivateProfile profile;
-    profile.LoadText(writer.Text());
-    EXPECT_EQ(profile.GetString("MUSIC", "Track00"), "one two three four");
-}
-
 }  // namespace
