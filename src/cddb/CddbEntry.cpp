@@ -126,8 +126,8 @@ std::string DecodeBody(std::string_view bytes) {
     return text;
 }
 
-// Steps 1 to 7: the status, the xmcd comment block and what the submitter wrote into it.
-EntryResult ParseHeader(LineReader& lines, CddbEntry& out) {
+// The leading comments: the xmcd mark, the frame offsets and the disc length.
+EntryResult ParseDiscComments(LineReader& lines, CddbEntry& out) {
     if (lines.AtEnd() || !IsComment(lines.Line()) || !Contains(lines.Line(), "xmcd")) {
         return EntryResult::NotXmcd;
     }
@@ -149,6 +149,11 @@ EntryResult ParseHeader(LineReader& lines, CddbEntry& out) {
     }
     out.discLengthSeconds = ReadAtoi(CommentText(lines.Line()).substr(13));
     lines.Next();
+    return EntryResult::Ok;
+}
+
+// The revision, when it is given, and the program that submitted the entry, which must be.
+EntryResult ParseSubmitter(LineReader& lines, CddbEntry& out) {
     for (; !lines.AtEnd() && IsComment(lines.Line()); lines.Next()) {
         const std::string_view line = lines.Line();
         if (Contains(line, "Revision:") || Contains(line, "Submitted via:")) {
@@ -182,7 +187,7 @@ EntryResult ParseHeader(LineReader& lines, CddbEntry& out) {
     return EntryResult::Ok;
 }
 
-// Steps 8 to 10: DISCID, then DTITLE right behind it, joined with one more DTITLE line.
+// DISCID, then DTITLE right behind it, joined with one more DTITLE line.
 EntryResult ParseDiscTitle(LineReader& lines, CddbEntry& out) {
     while (!lines.AtEnd() && !Contains(lines.Line(), "DISCID=")) {
         lines.Next();
@@ -221,7 +226,7 @@ EntryResult ParseDiscTitle(LineReader& lines, CddbEntry& out) {
     return EntryResult::Ok;
 }
 
-// Step 11. "TTITLE3=..." twice in a row is one long title; any other number starts the next
+// "TTITLE3=..." twice in a row is one long title; any other number starts the next
 // title, wherever the number points: titles are placed by line order, not by their numbers.
 EntryResult ParseTrackTitles(LineReader& lines, CddbEntry& out) {
     int previousNumber = 0;
@@ -242,7 +247,7 @@ EntryResult ParseTrackTitles(LineReader& lines, CddbEntry& out) {
     return EntryResult::Ok;
 }
 
-// Steps 12 to 14: EXTD, EXTT and PLAYORDER, each of which may be missing.
+// EXTD, EXTT and PLAYORDER, each of which may be missing.
 EntryResult ParseExtendedData(LineReader& lines, CddbEntry& out) {
     KeyLine keyLine;
     std::string discData;
@@ -336,7 +341,8 @@ EntryResult ParseEntry(std::string_view body, CddbEntry& out) {
     const std::string text = DecodeBody(body);
     LineReader lines(text);
     lines.Next();  // the status line
-    for (auto step : {ParseHeader, ParseDiscTitle, ParseTrackTitles, ParseExtendedData}) {
+    for (auto step :
+         {ParseDiscComments, ParseSubmitter, ParseDiscTitle, ParseTrackTitles, ParseExtendedData}) {
         if (const EntryResult result = step(lines, out); result != EntryResult::Ok) {
             return result;
         }
