@@ -1,5 +1,7 @@
 #include "platform/DiscDevice.h"
 
+#include "platform/TocFile.h"
+
 #include <cdio/cdio.h>
 #include <cdio/logging.h>
 #include <cdio/mmc.h>
@@ -103,36 +105,6 @@ bool ReadSheet(const std::string& path, std::string& text) {
     return true;
 }
 
-// libcdio resolves the FILE names of a .toc against the process's current directory, and
-// changing that directory would move it under every other thread. So a .toc that names its
-// files relative to itself is read through a copy that names them absolutely. libcdio takes a
-// keyword only as the first word of a line and the name up to the next quote; so does this.
-// Returns false when nothing needs changing or a name cannot be written absolutely.
-bool AbsoluteTocText(const std::string& text, const std::string& folder, std::string& out) {
-    if (folder.find('"') != std::string::npos) {
-        return false;
-    }
-    bool changed = false;
-    std::istringstream lines(text);
-    std::string line;
-    while (std::getline(lines, line)) {
-        const size_t word = line.find_first_not_of(" \t");
-        const size_t wordEnd = line.find_first_of(" \t", word);
-        const std::string keyword =
-            word == std::string::npos ? "" : line.substr(word, wordEnd - word);
-        const size_t open = line.find('"', wordEnd == std::string::npos ? line.size() : wordEnd);
-        if ((keyword == "FILE" || keyword == "AUDIOFILE" || keyword == "DATAFILE") &&
-            open != std::string::npos && open + 1 < line.size() && line[open + 1] != '/' &&
-            line[open + 1] != '"') {
-            line.insert(open + 1, folder + "/");
-            changed = true;
-        }
-        out += line;
-        out += '\n';
-    }
-    return changed;
-}
-
 // libcdio keeps the FILE name of a cue sheet that has no TRACK and never frees it; the poll reads
 // every image once a second, so such a sheet is turned away before libcdio sees it.
 bool CueHasTrack(const std::string& text) {
@@ -152,37 +124,6 @@ bool CueHasTrack(const std::string& text) {
     }
     return false;
 }
-
-// A temporary .toc, removed with the object.
-class TocCopy {
-public:
-    explicit TocCopy(const std::string& text) {
-        std::string pattern = (fs::temp_directory_path() / "ac-toc-XXXXXX.toc").string();
-        const int fd = ::mkstemps(pattern.data(), 4);
-        if (fd < 0) {
-            return;
-        }
-        const bool written =
-            ::write(fd, text.data(), text.size()) == static_cast<ssize_t>(text.size());
-        ::close(fd);
-        if (written) {
-            m_path = pattern;
-        } else {
-            ::unlink(pattern.c_str());
-        }
-    }
-    ~TocCopy() {
-        if (!m_path.empty()) {
-            ::unlink(m_path.c_str());
-        }
-    }
-    TocCopy(const TocCopy&) = delete;
-    TocCopy& operator=(const TocCopy&) = delete;
-    const std::string& Path() const { return m_path; }
-
-private:
-    std::string m_path;
-};
 
 // libcdio's cdrdao reader puts the lead-out at the last track's INDEX 01 plus the length of its
 // FILE statement, though with a START in the track that length includes the gap before INDEX

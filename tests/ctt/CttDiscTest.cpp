@@ -153,11 +153,12 @@ protected:
         }
         WriteFile(*s_dir / "disc.bin", bin);
         WriteFile(*s_dir / "disc.cue", cue);
-        // The first two tracks as a cdrdao TOC; libcdio wants MSF and an absolute FILE path.
+        // The first two tracks as a cdrdao TOC in MSF, naming its .bin relative to itself as
+        // cdrdao writes it: ctt runs in another folder and must still find it.
         const size_t first = (s_tracks[0].frames() + kSectorFrames - 1) / kSectorFrames;
-        WriteFile(*s_dir / "disc.toc", "CD_DA\nTRACK AUDIO\nFILE \"" + *s_dir / "disc.bin" + "\" 0 " +
-                                           Msf(first) + "\nTRACK AUDIO\nFILE \"" + *s_dir / "disc.bin" +
-                                           "\" " + Msf(first) + " " + Msf(300) + "\n");
+        WriteFile(*s_dir / "disc.toc", "CD_DA\nTRACK AUDIO\nFILE \"disc.bin\" 0 " + Msf(first) +
+                                           "\nTRACK AUDIO\nFILE \"disc.bin\" " + Msf(first) + " " +
+                                           Msf(300) + "\n");
         // The same image, cut off in the middle of track 2.
         ASSERT_EQ(mkdir((*s_dir / "cut").c_str(), 0755), 0);
         WriteFile(*s_dir / "cut/disc.cue", cue);

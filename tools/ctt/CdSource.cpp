@@ -5,6 +5,12 @@
 
 #include "Report.h"
 #include "Sources.h"
+#include "platform/TocFile.h"
+
+#include <filesystem>
+#include <fstream>
+#include <iterator>
+#include <memory>
 
 #include <cdio/cdio.h>
 #include <cdio/cdtext.h>
@@ -65,7 +71,21 @@ public:
         } else {
             driver = DRIVER_DEVICE;
         }
-        m_cdio = cdio_open(drivePath.c_str(), driver);
+        std::string openPath = drivePath;
+        if (driver == DRIVER_CDRDAO) {
+            // The program runs ctt in its own folder, not the image's: a .toc that names its
+            // .bin relative to itself is read through a copy that names it absolutely.
+            std::ifstream in(drivePath, std::ios::binary);
+            const std::string text((std::istreambuf_iterator<char>(in)), std::istreambuf_iterator<char>());
+            std::error_code error;
+            const std::string folder = std::filesystem::absolute(drivePath, error).parent_path().string();
+            std::string absolute;
+            if (platform::AbsoluteTocText(text, folder, absolute)) {
+                m_tocCopy = std::make_unique<platform::TocCopy>(absolute);
+                if (!m_tocCopy->Path().empty()) openPath = m_tocCopy->Path();
+            }
+        }
+        m_cdio = cdio_open(openPath.c_str(), driver);
         if (!m_cdio) {
             m_error = "cannot open the disc in \"" + drivePath + "\"";
             return false;
@@ -168,6 +188,8 @@ public:
     }
 
 private:
+    // A .toc read through a copy: removed after the destructor body has closed m_cdio.
+    std::unique_ptr<platform::TocCopy> m_tocCopy;
     // libcdio reads past the end of a cut-off .bin without complaint; a real drive would
     // report those sectors unreadable, so say so before a short track goes out as complete.
     bool ImageHoldsTrack() {
