@@ -34,23 +34,42 @@ DriveWatcher::PollResult DriveWatcher::PollDrives(platform::IDiscDevice& device,
         result.skipped = true;
         return result;
     }
+    bool selectedRead = false;
+    bool found = false;
     for (size_t i = 0; i < drives.size(); ++i) {
         platform::DiscTable table;
-        if (HoldsAudioDisc(device, drives[i], table)) {
+        const bool disc = HoldsAudioDisc(device, drives[i], table);
+        if (static_cast<int>(i) == selected) {
+            selectedRead = true;
+            result.selectedDiscId = disc ? DiscIdOf(table) : kNoDiscId;
+        }
+        if (disc) {
             if (!m_discSeen && !m_discLoaded) {
                 result.startLoadTimer = true;
             }
             m_discSeen = true;
-            return result;
+            found = true;
+            break;
         }
-        // The walk ends at the first drive with a disc, so a selected drive behind that one is
-        // not looked at and keeps its list.
         if (static_cast<int>(i) == selected) {
             result.emptySelected = true;
             m_discSeen = false;
         }
     }
-    m_discLoaded = false;
+    // The walk ends at the first drive with a disc; the selected drive behind it is read on its
+    // own, so its list empties when its disc goes and follows a disc swapped in its place.
+    if (!selectedRead && selected >= 0 && selected < static_cast<int>(drives.size())) {
+        platform::DiscTable table;
+        if (HoldsAudioDisc(device, drives[std::size_t(selected)], table)) {
+            result.selectedDiscId = DiscIdOf(table);
+        } else {
+            result.emptySelected = true;
+        }
+        return result;
+    }
+    if (!found) {
+        m_discLoaded = false;
+    }
     return result;
 }
 

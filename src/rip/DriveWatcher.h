@@ -19,6 +19,7 @@
 #include "platform/DiscDevice.h"
 
 #include <atomic>
+#include <cstdint>
 #include <string>
 #include <vector>
 
@@ -36,6 +37,9 @@ public:
         bool skipped = false;            // a drive was just loaded by hand; nothing was read
         bool startLoadTimer = false;     // a new disc: load the first one in a second
         bool emptySelected = false;      // the selected drive has no disc: empty record and list
+        // The disc id of what the selected drive holds now (kNoDiscId for none): a disc swapped
+        // between two polls shows as another id, and the panel loads it.
+        std::uint32_t selectedDiscId = 0xFFFFFFFF;
     };
 
     // One poll. selected: the index of the current drive in `drives`, -1 for none.

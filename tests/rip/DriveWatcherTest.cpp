@@ -2,6 +2,7 @@
 // out, and once against real disc images.
 
 #include "rip/DriveWatcher.h"
+#include "rip/TrackTable.h"
 
 #include "../support/DiscImages.h"
 #include "../support/TempDir.h"
@@ -89,6 +90,28 @@ TEST(DriveWatcherTest, DiscChangedByHandInOneDriveEmptiesThenLoadsWithinTwoTicks
     panel.Tick();
     panel.Tick();
     EXPECT_TRUE(panel.listFilled);
+}
+
+TEST(DriveWatcherTest, TheSelectedDriveIsFollowedBehindAnotherDiscAndThroughASwap) {
+    DriveWatcher watcher;
+    FakeDiscDevice device;
+    const std::vector<std::string> drives = {"/dev/sr0", "/dev/sr1"};
+    device.discs["/dev/sr0"] = ThreeTracks();
+    device.discs["/dev/sr1"] = ThreeTracks();
+    EXPECT_EQ(watcher.PollDrives(device, drives, 1, false).selectedDiscId, DiscIdOf(ThreeTracks()));
+
+    // Swapped between two polls: another id, which the panel loads.
+    DiscTable other = ThreeTracks();
+    other.leadOutLba += 750;
+    ASSERT_NE(DiscIdOf(other), DiscIdOf(ThreeTracks()));
+    device.discs["/dev/sr1"] = other;
+    EXPECT_EQ(watcher.PollDrives(device, drives, 1, false).selectedDiscId, DiscIdOf(other));
+
+    // Emptied while the first drive still holds its disc.
+    device.discs.erase("/dev/sr1");
+    const auto emptied = watcher.PollDrives(device, drives, 1, false);
+    EXPECT_TRUE(emptied.emptySelected);
+    EXPECT_EQ(emptied.selectedDiscId, kNoDiscId);
 }
 
 TEST(DriveWatcherTest, DiscInTheSecondDriveOnlyIsFoundThoughTheFirstIsSelected) {

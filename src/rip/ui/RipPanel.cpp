@@ -239,6 +239,12 @@ void CDRipDlg::StartPoll() {
 void CDRipDlg::OnPollDone(DriveWatcher::PollResult result) {
     if (result.startLoadTimer && !m_loadTimer.IsRunning()) m_loadTimer.StartOnce(1000);
     if (result.emptySelected && !m_rows.empty()) ClearDisc();
+    // Another disc in the same drive since the last poll (swapped quickly, or an image file
+    // replaced): its own tracks, not the old list.
+    if (result.selectedDiscId != kNoDiscId && !m_rows.empty() && result.selectedDiscId != m_discId &&
+        !m_driver.IsRunning()) {
+        LoadDriveContents(m_currentDrive);
+    }
     if (result.disableRipButtons) UpdateButtons();
 }
 
