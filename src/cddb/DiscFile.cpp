@@ -15,7 +15,7 @@ constexpr std::string_view kInfoSection = "CDINFO";
 constexpr std::string_view kMusicSection = "MUSIC";
 
 std::string TrackKey(int index) {
-    char key[16];
+    char key[24];
     std::snprintf(key, sizeof key, "Track%02d", index);
     return key;
 }

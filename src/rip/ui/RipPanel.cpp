@@ -153,7 +153,7 @@ void CDRipDlg::FillList(int driveIndex, const platform::DiscTable& table) {
         const int index = m_list->InsertItem(m_list->GetItemCount(), "");
         m_list->SetCheckbox(index, kColCheck, 1);
         m_list->SetItemText(index, kColName, track.title);
-        char number[8];
+        char number[16];
         std::snprintf(number, sizeof number, "%02d", track.number);
         m_list->SetItemText(index, kColTrack, number);
         m_list->SetItemText(index, kColDuration, DurationText(track.durationSeconds));
