@@ -180,6 +180,7 @@ void CTestHook::DescribePanels(const CAudioEncDlg& dlg, std::ostream& out) {
         out << "ripdrives=" << drives.size() << "\n";
         out << "ripboxes=" << g_RipDlg->DescribeBoxes() << "\n";
         out << "riprunning=" << (g_RipDlg->Driver().IsRunning() ? 1 : 0) << "\n";
+        out << "riploadms=" << g_RipDlg->LastLoadMs() << "\n";
         out << "ripdiscid=" << std::hex << g_RipDlg->DiscId() << std::dec << "\n";
     }
     if (g_OutputPanel != nullptr) {

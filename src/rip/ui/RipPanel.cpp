@@ -21,6 +21,7 @@
 #include <wx/textctrl.h>
 
 #include <algorithm>
+#include <chrono>
 #include <cstdlib>
 #include <sstream>
 
@@ -110,12 +111,14 @@ void CDRipDlg::ClearDisc() {
 
 void CDRipDlg::LoadDriveContents(int driveIndex) {
     if (driveIndex < 0 || driveIndex >= static_cast<int>(m_drives.size()) || m_driver.IsRunning()) return;
+    const auto started = std::chrono::steady_clock::now();
     m_watcher.SkipNextPoll();
     ClearDisc();
     SetCurrentDrive(driveIndex);
     platform::DiscTable table;
     m_device->ReadToc(m_drives[std::size_t(driveIndex)], table);
     FillList(driveIndex, table);
+    m_lastLoadMs = std::chrono::duration<double, std::milli>(std::chrono::steady_clock::now() - started).count();
 }
 
 void CDRipDlg::LoadFirstDisc() {

@@ -153,6 +153,8 @@ public:
     void RenameRow(int row, const std::string& text);
     void ClickRow(int row);
     std::string DescribeBoxes() const;
+    // How long the last disc took to reach the list (table, record, rows), for the benchmarks.
+    double LastLoadMs() const { return m_lastLoadMs; }
 
     // ---- IRipList ----
     int RowCount() override;
@@ -247,6 +249,7 @@ private:
     std::atomic<int> m_checkedSeconds{0};
     std::string m_cddbFolder;
     wxColour m_cellText;
+    double m_lastLoadMs = 0;
 
     std::thread m_worker;
     std::atomic<bool> m_workerBusy{false};
