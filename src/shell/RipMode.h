@@ -27,7 +27,7 @@ public:
     // Select CD Rom: one entry per drive, the current one checked, then Add Disc Image.
     void FillDriveMenu(wxMenu& popup);
 
-    bool IsRunActive() const { return m_panel.Driver().ToolRunning(); }
+    bool IsRunActive() const { return m_panel.Driver().IsRunning(); }
     double DoneSeconds() const;
     double TotalSeconds() const { return m_panel.CheckedSeconds(); }
 
