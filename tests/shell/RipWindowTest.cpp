@@ -78,7 +78,7 @@ protected:
         image = ac::test::WriteDiscImage(home / "images", "disc", specs, {});
         ac::test::WriteSettings(home, "last_run_function=dword:1\nOutputCDDir=sz:" + out +
                                           "\ncdimages=sz:" + image.cuePath + "\nlocalcddb=sz:" +
-                                          (home / "cddb") + "\n");
+                                          (home / "cddb") + "\nafterconvert=dword:0\n");
     }
 
     ac::test::TempDir home;
@@ -144,6 +144,13 @@ TEST_F(RipWindowTest, ADiscImageLoadsNamedFromItsRecordAndRipsCheckedTracksSampl
         EXPECT_FALSE(entry.path().filename().string().ends_with(".part")) << entry.path();
     }
     EXPECT_NE(Field(state, "statustext").find("2"), std::string::npos);  // the run's tally
+
+    // The end of a rip runs the after-run action: its countdown, cancelled here.
+    state = program.WaitFor([](const State& s) { return Field(s, "countdown") == "1"; });
+    ASSERT_EQ(Field(state, "countdown"), "1");
+    program.Send("dialog cancel");
+    program.WaitFor([](const State& s) { return Field(s, "countdown") == "0"; });
+    EXPECT_FALSE(fs::exists(home / "power.txt"));
 
     // The disc goes (the image is renamed away): the list empties by itself.
     fs::rename(image.cuePath, image.cuePath + ".gone");
