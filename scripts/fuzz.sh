@@ -9,7 +9,11 @@ CC=clang CXX=clang++ cmake -S "$top" -B "$build" -G Ninja -DAC_FUZZ=ON -DAC_BUIL
 cmake --build "$build" -j "${JOBS:-2}" --target data_pkg \
   $(cd "$top/tests/fuzz" && ls fuzz_*.cpp | sed 's/\.cpp$//')
 mkdir -p "$build/findings"
+# FUZZ_TARGETS="fuzz_xmcd fuzz_ini" runs only those.
 for src in "$top"/tests/fuzz/fuzz_*.cpp; do
+  if [ -n "${FUZZ_TARGETS:-}" ] && ! [[ " $FUZZ_TARGETS " == *" $(basename "$src" .cpp) "* ]]; then
+    continue
+  fi
   name=$(basename "$src" .cpp)
   corpus="$build/corpus/$name"
   mkdir -p "$corpus"
@@ -17,6 +21,8 @@ for src in "$top"/tests/fuzz/fuzz_*.cpp; do
     fuzz_ini|fuzz_settings) seeds="$top/../shared/corpus/ini" ;;
     fuzz_language) seeds="$top/data/lang" ;;
     fuzz_cue_sheet|fuzz_ctt_cue) seeds="$top/../shared/corpus/cue" ;;
+    fuzz_xmcd) seeds="$top/../shared/corpus/xmcd" ;;
+    fuzz_cddb_ini) seeds="$top/../shared/corpus/cddb" ;;
     fuzz_package) seeds="$build/seeds/package"
       mkdir -p "$seeds" && cp -f "$build/bin/data.pkg" "$seeds/" 2>/dev/null || true ;;
     *) seeds="" ;;

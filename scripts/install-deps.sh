@@ -7,7 +7,7 @@ packages=(
   # toolchain
   build-essential cmake ninja-build pkg-config ccache clang libclang-rt-14-dev
   # toolkit and libraries
-  libwxgtk3.2-dev libzip-dev zlib1g-dev
+  libwxgtk3.2-dev libgtk-3-dev libzip-dev zlib1g-dev
   libavformat-dev libavcodec-dev libswresample-dev libavutil-dev
   libcdio-dev libcdio-paranoia-dev libburn-dev libisofs-dev libsdl2-dev libuchardet-dev
   # tests and benchmarks

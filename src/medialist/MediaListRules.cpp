@@ -138,7 +138,17 @@ std::string TrimOutputDirectory(std::string_view text) {
     return std::string(text);
 }
 
-std::string OpenDialogFilter(const std::function<std::string(std::uint32_t)>& text) {
+std::string OpenDialogFilter(const std::function<std::string(std::uint32_t)>& text,
+                             const std::vector<std::string>& more) {
+    std::string all = kFilterPatterns[0];
+    for (const std::string& extension : more) {
+        const std::string pattern = "*." + Lower(extension);
+        const bool clean = !extension.empty() &&
+                           extension.find_first_of("|;*?/ ") == std::string::npos;
+        if (clean && (";" + all + ";").find(";" + pattern + ";") == std::string::npos) {
+            all += ";" + pattern;
+        }
+    }
     std::string filter;
     for (int i = 0; i < kFilterEntryCount; ++i) {
         if (i > 0) {
@@ -147,7 +157,7 @@ std::string OpenDialogFilter(const std::function<std::string(std::uint32_t)>& te
         std::string label = text(kFilterLabelFirstId + static_cast<std::uint32_t>(i));
         // A bar in a translated label would split the entry in two.
         std::replace(label.begin(), label.end(), '|', '/');
-        filter += label + "|" + kFilterPatterns[std::size_t(i)];
+        filter += label + "|" + (i == 0 ? all : std::string(kFilterPatterns[std::size_t(i)]));
     }
     return filter;
 }

@@ -45,7 +45,10 @@ std::string TrimOutputDirectory(std::string_view text);
 
 // The file dialog's filter in wx's "label|patterns|label|patterns" form; labels come through
 // `text` (a language lookup by id).
-std::string OpenDialogFilter(const std::function<std::string(std::uint32_t)>& text);
+// `more` are further extensions (without the dot) for the first, "all supported" entry: what
+// the installed FFmpeg reads beyond the fixed list.
+std::string OpenDialogFilter(const std::function<std::string(std::uint32_t)>& text,
+                             const std::vector<std::string>& more = {});
 
 // Text ids of the filter's labels: the first entry, then one per family, "All Files" last.
 inline constexpr std::uint32_t kFilterLabelFirstId = 0xC100;

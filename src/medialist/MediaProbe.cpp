@@ -28,9 +28,9 @@ std::int32_t ClampToInt32(std::int64_t v) {
 // file. The file wins; the first audio stream fills the gaps.
 std::string Tag(const AVFormatContext* ic, const AVStream* audio,
                 std::initializer_list<const char*> keys) {
-    for (const AVDictionary* dict : {static_cast<const AVDictionary*>(ic->metadata),
-                                     audio ? static_cast<const AVDictionary*>(audio->metadata)
-                                           : nullptr}) {
+    for (const AVDictionary* dict :
+         {static_cast<const AVDictionary*>(ic->metadata),
+          audio ? static_cast<const AVDictionary*>(audio->metadata) : nullptr}) {
         for (const char* key : keys) {
             if (const AVDictionaryEntry* e = av_dict_get(dict, key, nullptr, 0); e && *e->value) {
                 // RIFF INFO and some old taggers store bytes with no code page.
@@ -44,10 +44,14 @@ std::string Tag(const AVFormatContext* ic, const AVStream* audio,
 std::string CodecName(const AVCodecParameters* par) {
     // The MPEG audio layers keep their plain names: the float decoders are an FFmpeg detail.
     switch (par->codec_id) {
-        case AV_CODEC_ID_MP1: return "mp1";
-        case AV_CODEC_ID_MP2: return "mp2";
-        case AV_CODEC_ID_MP3: return "mp3";
-        default: break;
+        case AV_CODEC_ID_MP1:
+            return "mp1";
+        case AV_CODEC_ID_MP2:
+            return "mp2";
+        case AV_CODEC_ID_MP3:
+            return "mp3";
+        default:
+            break;
     }
     if (const AVCodec* dec = avcodec_find_decoder(par->codec_id)) {
         return dec->name;
@@ -170,7 +174,8 @@ bool HeaderIsComplete(const AVFormatContext* ic, bool anyCodec) {
     }
     for (unsigned i = 0; i < ic->nb_streams; ++i) {
         const AVCodecParameters* par = ic->streams[i]->codecpar;
-        const bool pcm = par->codec_id >= AV_CODEC_ID_PCM_S16LE && par->codec_id < AV_CODEC_ID_ADPCM_IMA_QT;
+        const bool pcm =
+            par->codec_id >= AV_CODEC_ID_PCM_S16LE && par->codec_id < AV_CODEC_ID_ADPCM_IMA_QT;
         const bool trusted = pcm || (anyCodec && par->codec_id != AV_CODEC_ID_AAC &&
                                      par->codec_id != AV_CODEC_ID_NONE);
         if (par->codec_type != AVMEDIA_TYPE_AUDIO || !trusted || par->sample_rate <= 0 ||
@@ -228,7 +233,8 @@ int ProbeFile(const std::string& path, MediaFileInfo& info) {
     }
 
     AVFormatContext* ic = nullptr;
-    if (const int opened = avformat_open_input(&ic, mediaPath.c_str(), nullptr, nullptr); opened < 0) {
+    if (const int opened = avformat_open_input(&ic, mediaPath.c_str(), nullptr, nullptr);
+        opened < 0) {
         info.bitRate = 0;
         info.probeError = OpenErrorText(mediaPath, opened);
         return 0;
@@ -283,17 +289,60 @@ int ProbeFile(const std::string& path, MediaFileInfo& info) {
         } else if (durationUs != AV_NOPTS_VALUE) {
             durationUs = std::max<std::int64_t>(durationUs - startUs, 0);
         }
-        if (!span.title.empty()) info.title = span.title;
-        if (!span.performer.empty()) info.author = span.performer;
-        if (!span.album.empty()) info.album = span.album;
-        if (!span.genre.empty()) info.genre = span.genre;
+        if (!span.title.empty())
+            info.title = span.title;
+        if (!span.performer.empty())
+            info.author = span.performer;
+        if (!span.album.empty())
+            info.album = span.album;
+        if (!span.genre.empty())
+            info.genre = span.genre;
         const int year = std::atoi(span.date.c_str());
-        if (year > 0 && year < 2100) info.year = std::to_string(year);
+        if (year > 0 && year < 2100)
+            info.year = std::to_string(year);
         info.track = span.trackNumber;
     }
     SetDuration(info, durationUs);
     avformat_close_input(&ic);
     return 1;
+}
+
+std::vector<std::string> DemuxerExtensions() {
+    std::vector<std::string> extensions;
+    void* opaque = nullptr;
+    while (const AVInputFormat* format = av_demuxer_iterate(&opaque)) {
+        if (format->extensions == nullptr) {
+            continue;
+        }
+        std::string list = format->extensions;
+        for (std::size_t start = 0; start <= list.size();) {
+            std::size_t comma = list.find(',', start);
+            if (comma == std::string::npos) {
+                comma = list.size();
+            }
+            std::string extension = list.substr(start, comma - start);
+            std::transform(extension.begin(), extension.end(), extension.begin(),
+                           [](unsigned char c) { return static_cast<char>(std::tolower(c)); });
+            if (!extension.empty()) {
+                extensions.push_back(std::move(extension));
+            }
+            start = comma + 1;
+        }
+    }
+    // Demuxers that recognise their files by content name no extension; users still know
+    // these files by these names.
+    static const std::pair<const char*, const char*> kByContent[] = {
+        {"aif", "aiff"},      {"aiff", "aiff"}, {"aifc", "aiff"}, {"wav", "wav"},
+        {"opus", "ogg"},      {"oga", "ogg"},   {"spx", "ogg"},   {"mka", "matroska"},
+        {"webm", "matroska"}, {"w64", "w64"},   {"caf", "caf"},   {"m4b", "mov"}};
+    for (const auto& [extension, demuxer] : kByContent) {
+        if (av_find_input_format(demuxer) != nullptr) {
+            extensions.emplace_back(extension);
+        }
+    }
+    std::sort(extensions.begin(), extensions.end());
+    extensions.erase(std::unique(extensions.begin(), extensions.end()), extensions.end());
+    return extensions;
 }
 
 }  // namespace ac

@@ -6,6 +6,7 @@
 // Thread contract: any thread; FFmpeg's demuxers keep no global state that needs a lock.
 
 #include <string>
+#include <vector>
 
 #include "medialist/MediaFileInfo.h"
 
@@ -19,6 +20,9 @@ namespace ac {
 // anyCodec, compressed audio is trusted too (except AAC, whose header may give half the rate
 // of an SBR stream): enough for probing, while a decoder set-up wants the full look.
 bool HeaderIsComplete(const AVFormatContext* ic, bool anyCodec = false);
+
+// Every file extension a demuxer of the linked FFmpeg names, lower case, sorted, once each.
+std::vector<std::string> DemuxerExtensions();
 
 // 1 when the file could be opened (info then holds what was found), 0 when not.
 int ProbeFile(const std::string& path, MediaFileInfo& info);

@@ -18,6 +18,7 @@
 #include "shell/ProgramIcon.h"
 #include "shell/RipMode.h"
 #include "convert/RowParameters.h"
+#include "skin/NativeControls.h"
 #include "skin/ShutDownDlg.h"
 #include "skin/ChooseSkinDlg.h"
 #include "skin/ListCtrl.h"
@@ -114,8 +115,9 @@ void CAudioEncDlg::OnInitDialog() {
     g_MainDlg = this;
     InstallWxUiQueue();
     if (BoxesAreScripted()) {
-        SetProfileMessageHook(
-            [this](const std::string& text, long style) { return AppMessageBox(text, style, this); });
+        SetProfileMessageHook([this](const std::string& text, long style) {
+            return AppMessageBox(text, style, this);
+        });
     }
     SetMainHub(this);
     wxIconBundle icons;
@@ -306,6 +308,12 @@ bool CAudioEncDlg::OnSkinChanged(const std::string& skinDir) {
     m_sideBarWidth = skin.GetInt("Width", 200, "SideBar");
     m_checkRightMargin = skin.GetInt("RightMargin", 5, "Check");
     m_checkGapHeight = skin.GetInt("GapHeight", 27, "Check");
+    // Entry fields and drop-down lists take the side bar's field and text colours, the ones its
+    // property grid shows, wherever they stand.
+    const int field = skin.GetInt("PropertyBgColor", 255, "SideBar");
+    SetNativeControlColours(
+        NativeColoursFor(field == 255 ? *wxWHITE : NativeColour(static_cast<std::uint32_t>(field)),
+                         NativeColour(skin.GetRgbColour("TextColor", 0, "SideBar"))));
     const bool taken = ImSkinFrame::OnSkinChanged(skinDir);
     m_fileInfoBodyColour = m_skin.GetString("BodyBgColor", "#F3F6FA", "FileInfo");
     return taken;
@@ -322,7 +330,14 @@ void CAudioEncDlg::RecalcLayout() {
     if (g_StatusWnd != nullptr) {
         m_panels[Status]->SetSize(-1, g_StatusWnd->GetNeededHeight());
     }
-    const int sideWidth = m_sideBarWidth;
+    int sideWidth = m_sideBarWidth;
+    if (g_SideBar != nullptr) {
+        // A window wider than its smallest size gives the side bar up to half of what it has
+        // to spare, enough to show the longest profile name whole.
+        const int spare = std::max(0, GetSize().x - GetMinWidth());
+        sideWidth =
+            std::clamp(g_SideBar->NeededWidth(), m_sideBarWidth, m_sideBarWidth + spare / 2);
+    }
     const int rightMargin = m_checkRightMargin;
     const int gapHeight = m_checkGapHeight;
     const wxRect content = GetContentRect();

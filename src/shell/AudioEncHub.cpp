@@ -235,6 +235,8 @@ void CAudioEncDlg::OnCatalogueLoaded() {
     if (mode == 0 || mode == 1) {
         g_SideBar->SelectIndex(m_check->m_profileIndex[static_cast<std::size_t>(mode)], false);
     }
+    // The side bar may now want more room for its longest profile name.
+    RecalcLayout();
 }
 
 std::vector<ParameterSet*> CAudioEncDlg::SelectedSets() {

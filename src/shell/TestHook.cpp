@@ -16,6 +16,7 @@
 #include "shell/ConvertMode.h"
 #include "shell/MenuTables.h"
 #include "shell/MessageBoxes.h"
+#include "skin/NativeControls.h"
 #include "skin/ChooseSkinDlg.h"
 #include "skin/ListCtrl.h"
 #include "skin/ShutDownDlg.h"
@@ -100,6 +101,8 @@ std::string CTestHook::DescribeState(const CAudioEncDlg& dlg) {
     out << "title=" << dlg.GetTitle().utf8_string() << "\n";
     out << "rect=" << r.x << "," << r.y << "," << r.width << "," << r.height << "\n";
     out << "mode=" << dlg.GetWorkMode() << "\n";
+    out << "fields=" << CurrentNativeControlColours().background.GetAsString(wxC2S_HTML_SYNTAX)
+        << "/" << CurrentNativeControlColours().text.GetAsString(wxC2S_HTML_SYNTAX) << "\n";
     static const char* const kNames[CAudioEncDlg::PanelCount] = {"MediaList",   "CDCreatorPanel", "OutputPanel",
                                                    "PlayerPanel", "CDRip",          "SideBar",
                                                    "StatusBar"};

@@ -108,6 +108,9 @@ void XListCtrl::SyncRowCount() {
     m_rowCountPosted = false;
     if (m_body->GetRowCount() != m_rows.size()) {
         m_body->SetRowCount(m_rows.size());
+        // Rows filled before the count was known were refreshed outside the body's extent:
+        // without this a row added to a quiet window stays unpainted until the next event.
+        m_body->Refresh();
     }
 }
 
@@ -361,6 +364,10 @@ void ImHeaderCtrl::SetColors(const wxColour& high, const wxColour& shadow,
     m_background = background;
     m_text = text;
     Refresh();
+}
+
+void ImHeaderCtrl::SetSkinColors(const wxColour& background, const wxColour& text) {
+    SetColors(background.ChangeLightness(130), background.ChangeLightness(72), background, text);
 }
 
 void ImHeaderCtrl::OnPaint(wxPaintEvent& /*event*/) {

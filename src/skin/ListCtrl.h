@@ -119,6 +119,9 @@ public:
     void SetBackground(SkinPicture picture, int mode, int topSplitter, int bottomSplitter);
     void SetColors(const wxColour& high, const wxColour& shadow, const wxColour& background,
                    const wxColour& text);
+    // The desktop's 3D colours are white edges on any background; a skinned header draws its
+    // column separators as a lighter and a darker shade of its own background instead.
+    void SetSkinColors(const wxColour& background, const wxColour& text);
 
 private:
     void OnPaint(wxPaintEvent& event);

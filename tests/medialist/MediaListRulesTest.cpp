@@ -98,6 +98,14 @@ TEST(MediaListRules, FilterHasALabelAndPatternsPerEntry) {
     EXPECT_NE(parts[1].find("*.cda"), std::string::npos);
     EXPECT_EQ(parts[2 * 22 + 1], "*.wma;*.wmv;*.asf") << "no blanks between patterns";
     EXPECT_EQ(parts.back(), "*");
+
+    // Extensions of the installed FFmpeg join the first entry once each; junk never splits it.
+    const std::string wider = OpenDialogFilter([](std::uint32_t) { return std::string("L"); },
+                                               {"mkv", "OPUS", "mp3", "a|b", "", "x;y", "aif"});
+    const std::string all = wider.substr(2, wider.find('|', 2) - 2);
+    EXPECT_NE(all.find(";*.mkv;*.opus;*.aif"), std::string::npos) << all;
+    EXPECT_EQ(all.find("*.mp3"), all.rfind("*.mp3")) << "listed twice";
+    EXPECT_EQ(std::count(wider.begin(), wider.end(), '|'), 2 * kFilterEntryCount - 1);
 }
 
 }  // namespace

@@ -114,5 +114,15 @@ TEST_F(Probing, UnopenableFilesAnswerZeroWithNoDuration) {
     }
 }
 
+// The Add dialog offers what FFmpeg reads; files a user has that the fixed list never named.
+TEST(DemuxerExtensionsTest, NameTheContainersUsersHave) {
+    const std::vector<std::string> extensions = DemuxerExtensions();
+    for (const std::string wanted : {"mkv", "webm", "aif", "flac", "wav", "opus"}) {
+        EXPECT_TRUE(std::binary_search(extensions.begin(), extensions.end(), wanted)) << wanted;
+    }
+    EXPECT_TRUE(std::is_sorted(extensions.begin(), extensions.end()));
+    EXPECT_EQ(std::adjacent_find(extensions.begin(), extensions.end()), extensions.end());
+}
+
 }  // namespace
 }  // namespace ac

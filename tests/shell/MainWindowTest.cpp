@@ -55,8 +55,12 @@ TEST_F(MainWindowTest, TheWindowResizesAndMaximisesAndMenusCloseWhenTheUserLooks
     program.Send("move 10 10 1100 800");
     State state = program.WaitFor([](const State& s) { return s.at("rect") == "10,10,1100,800"; });
     EXPECT_EQ(state.at("rect"), "10,10,1100,800");
+    EXPECT_EQ(state.at("selectorfits"), "0") << "too narrow for the longest profile";
+    program.Send("move 10 10 1260 900");
+    state = program.WaitFor([](const State& s) { return s.at("selectorfits") == "1"; });
+    EXPECT_EQ(state.at("selectorfits"), "1") << "room to spare shows the longest profile whole";
     program.Send("move 10 10 300 200");
-    state = program.WaitFor([](const State& s) { return s.at("rect") != "10,10,1100,800"; });
+    state = program.WaitFor([](const State& s) { return s.at("rect") != "10,10,1260,900"; });
     EXPECT_EQ(state.at("rect"), "10,10,840,634") << "never smaller than the design size";
 
     for (const char* away : {"press", "key"}) {
@@ -159,9 +163,11 @@ TEST_F(MainWindowTest, ChangesOfSkinAndLanguageReachEveryWindow) {
     std::this_thread::sleep_for(500ms);
     const std::string before = Screenshot(m_home, "before.png");
 
+    EXPECT_EQ(program.WaitShown().at("fields"), "#FFFFFF/#2A3342");
     program.Send("skin Midnight");
     State state = program.WaitFor([](const State& s) { return s.at("skin") == "Midnight"; });
     EXPECT_EQ(state.at("skin"), "Midnight");
+    EXPECT_EQ(state.at("fields"), "#21262F/#E3E6EB") << "entries and lists are dark too";
     std::this_thread::sleep_for(500ms);
     EXPECT_NE(Screenshot(m_home, "after.png"), before) << "the window looks different";
 

@@ -54,11 +54,17 @@ std::unique_ptr<MediaItem> CMediaListWnd::MakeItem(const std::string& sourcePath
     return item;
 }
 
+namespace {
+constexpr std::uint32_t kAddFilesTitleId = 0xC184;
+}  // namespace
+
 void CMediaListWnd::AddFiles() {
     AppConfig& config = GetAppConfig();
-    const std::string filter =
-        OpenDialogFilter([](std::uint32_t id) { return g_Language.GetString(id); });
-    wxFileDialog dialog(this, wxEmptyString, wxString::FromUTF8(config.GetString("last_openpath")),
+    // Computed once: the demuxers of the linked FFmpeg do not change while the program runs.
+    static const std::vector<std::string> s_ffmpegExtensions = DemuxerExtensions();
+    const std::string filter = OpenDialogFilter(
+        [](std::uint32_t id) { return g_Language.GetString(id); }, s_ffmpegExtensions);
+    wxFileDialog dialog(this, wxString::FromUTF8(g_Language.GetString(kAddFilesTitleId)), wxString::FromUTF8(config.GetString("last_openpath")),
                         wxEmptyString, wxString::FromUTF8(filter),
                         wxFD_OPEN | wxFD_MULTIPLE | wxFD_FILE_MUST_EXIST);
     if (dialog.ShowModal() != wxID_OK) {

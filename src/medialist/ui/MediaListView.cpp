@@ -356,9 +356,7 @@ bool CMediaListWnd::OnSkinChanged(const std::string& skinDir) {
                                                                        section)));
     const int headerColour = m_skin.GetInt("HeaderBgColor", -1, section);
     if (auto* header = dynamic_cast<ImHeaderCtrl*>(HeaderOf(*m_list)); header && headerColour != -1) {
-        header->SetColors(wxSystemSettings::GetColour(wxSYS_COLOUR_3DHIGHLIGHT),
-                          wxSystemSettings::GetColour(wxSYS_COLOUR_3DSHADOW),
-                          NativeColour(static_cast<std::uint32_t>(headerColour)), m_cellText);
+        header->SetSkinColors(NativeColour(static_cast<std::uint32_t>(headerColour)), m_cellText);
     }
     m_list->SetHeaderPicture(LoadSkinPicture(m_skin.GetString("HeaderBack", "", section)),
                              m_skin.GetInt("HeaderBgMode", 0, section),

@@ -7,6 +7,7 @@
 #include "resources/Language.h"
 #include "resources/TextFormat.h"
 #include "shell/AppConfig.h"
+#include "skin/NativeControls.h"
 #include "skin/SkinLabels.h"
 #include "skin/WindowTranslation.h"
 
@@ -59,6 +60,7 @@ COutputPanelWnd::COutputPanelWnd(wxWindow* parent)
     AppConfig& config = GetAppConfig();
     m_showType = config.GetInt("last_run_function");
     CreateControls();
+    FollowSkinColoursBelow(this);
     m_spin->SetRange(kCopiesMin, kCopiesMax);
     const int copies = std::clamp(config.GetInt("burncopies"), kCopiesMin, kCopiesMax);
     m_spin->SetValue(copies);

@@ -211,7 +211,7 @@ void PropertiesCtrl::PaintHelpPane() {
     int y = pane.GetTop() + kGripHeight + 2;
     wxFont bold = m_tree->TreeFont();
     dc.SetFont(bold.MakeBold());
-    dc.SetTextForeground(wxSystemSettings::GetColour(wxSYS_COLOUR_WINDOWTEXT));
+    dc.SetTextForeground(m_tree->TextColour());
     dc.DrawText(wxString::FromUTF8(node->item->label), kHelpMargin, y);
     y += dc.GetCharHeight() + 2;
     dc.SetFont(m_tree->TreeFont());
@@ -285,6 +285,11 @@ void PropertiesCtrl::SetBackgroundColour2(const wxColour& background,
                                           const wxColour& commentBackground) {
     m_tree->SetRowBackground(background);
     m_impl->commentBackground = commentBackground;
+    Refresh(false);
+}
+
+void PropertiesCtrl::SetTextColour2(const wxColour& text) {
+    m_tree->SetTextColour(text);
     Refresh(false);
 }
 

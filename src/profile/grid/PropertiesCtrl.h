@@ -59,6 +59,7 @@ public:
     void SetGridLineColor(const wxColour& colour, bool exact);
     wxColour GetGridLineColor() const;
     void SetBackgroundColour2(const wxColour& background, const wxColour& commentBackground);
+    void SetTextColour2(const wxColour& text);
     void SetTreeFont(const wxFont& font);
     // Lines the drop-down list of a list editor shows before it scrolls; at least 2.
     void SetListLines(int lines);

@@ -14,7 +14,8 @@ PropertyTree::PropertyTree(PropertiesCtrl* owner, int id)
                wxVSCROLL | wxWANTS_CHARS | wxBORDER_NONE | wxFULL_REPAINT_ON_RESIZE,
                "PropertyTree"),
       m_owner(owner),
-      m_background(wxSystemSettings::GetColour(wxSYS_COLOUR_LISTBOX)) {
+      m_background(wxSystemSettings::GetColour(wxSYS_COLOUR_LISTBOX)),
+      m_textColour(wxSystemSettings::GetColour(wxSYS_COLOUR_WINDOWTEXT)) {
     SetBackgroundStyle(wxBG_STYLE_PAINT);
     m_edit = new InPlaceEdit(this, this);
     m_list = new InPlaceList(this);
@@ -430,6 +431,13 @@ int PropertyTree::SetLabelColumnWidth(int width) {
 
 void PropertyTree::SetGridLineColor(const wxColour& colour) {
     m_gridLineColor = colour;
+    Refresh();
+}
+
+void PropertyTree::SetTextColour(const wxColour& colour) {
+    m_textColour = colour;
+    m_edit->SetForegroundColour(colour);
+    m_list->EditWindow()->SetForegroundColour(colour);
     Refresh();
 }
 

@@ -76,6 +76,9 @@ public:
     void SetGridLineColor(const wxColour& colour);
     const wxColour& RowBackground() const { return m_background; }
     void SetRowBackground(const wxColour& colour);
+    // Text of labels, values and the help pane; a dark skin needs light text on its rows.
+    const wxColour& TextColour() const { return m_textColour; }
+    void SetTextColour(const wxColour& colour);
     const wxFont& TreeFont() const;
     void SetTreeFont(const wxFont& font);
     void EnableToolTips(bool enable);
@@ -138,6 +141,7 @@ private:
     int m_labelColumnWidth = kDefaultLabelColumnWidth;
     wxColour m_gridLineColor{192, 192, 192};
     wxColour m_background;
+    wxColour m_textColour;
     mutable wxFont m_font;
     mutable int m_rowHeight = 0;
     bool m_toolTipsEnabled = false;

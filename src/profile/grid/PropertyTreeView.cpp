@@ -142,7 +142,7 @@ void PropertyTree::PaintRow(wxDC& dc, const PropertyNode* node, const wxRect& ro
     const bool selected = node == m_selection;
     const wxColour highlight = focused ? wxSystemSettings::GetColour(wxSYS_COLOUR_HIGHLIGHT)
                                        : Blend(m_background, m_gridLineColor, 0.55);
-    const wxColour text = wxSystemSettings::GetColour(wxSYS_COLOUR_WINDOWTEXT);
+    const wxColour text = m_textColour;
     const wxColour selectedText = focused
                                       ? wxSystemSettings::GetColour(wxSYS_COLOUR_HIGHLIGHTTEXT)
                                       : text;

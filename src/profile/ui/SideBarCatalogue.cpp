@@ -150,6 +150,12 @@ void CSideBarWnd::AdjustDropDownWidth() {
                       2 * std::max(0, wxSystemSettings::GetMetric(wxSYS_EDGE_X));
 }
 
+int CSideBarWnd::NeededWidth() const {
+    const wxSize save = m_saveButton->FitSize();
+    return m_metrics.LeftMargin + m_profileSelector->GetBestSize().x + m_metrics.HSpacing +
+           std::max(save.x, 28) + m_metrics.RightMargin;
+}
+
 void CSideBarWnd::RebuildSelectorTexts() {
     const int selected = m_profileSelector->GetSelection();
     m_profileSelector->Clear();
@@ -365,6 +371,9 @@ std::string CSideBarWnd::DescribeState() const {
                 : std::string())
         << "\n";
     out << "profiles=" << m_catalogue.Count() << "\n";
+    // 1 when the closed selector shows its longest entry whole.
+    out << "selectorfits="
+        << (m_profileSelector->GetSize().x >= m_profileSelector->GetBestSize().x ? 1 : 0) << "\n";
     out << "profiles_list=";
     for (unsigned i = 0; i < m_profileSelector->GetCount(); ++i) {
         out << "|" << m_profileSelector->GetString(i).utf8_string();

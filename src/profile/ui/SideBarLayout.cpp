@@ -23,6 +23,7 @@ namespace {
 constexpr int kLabelHeight = 18;
 constexpr int kSliderHeight = 24;
 constexpr int kEditHeight = 26;
+constexpr int kSkinColourNotSet = 255;
 
 }  // namespace
 
@@ -30,18 +31,19 @@ bool CSideBarWnd::OnSkinChanged(const std::string& skinDir) {
     ImSkinPanel::OnSkinChanged(skinDir);
     const char* section = GetSkinSection();
     const wxColour panelBg = Look().childBg;
-    const wxColour propertyBg =
-        m_skin.GetString("PropertyBgColor", "", section).empty()
-            ? *wxWHITE
-            : NativeColour(m_skin.GetRgbColour("PropertyBgColor", 0, section));
-    const wxColour commentBg =
-        m_skin.GetString("CommentBgColor", "", section).empty()
-            ? panelBg
-            : NativeColour(m_skin.GetRgbColour("CommentBgColor", 0, section));
+    // These three are native colours where 255 means "not set": a skin cannot ask for pure red.
+    auto nativeOr = [&](const char* key, const wxColour& fallback) {
+        const int value = m_skin.GetInt(key, kSkinColourNotSet, section);
+        return value == kSkinColourNotSet ? fallback : NativeColour(static_cast<std::uint32_t>(value));
+    };
+    const wxColour propertyBg = nativeOr("PropertyBgColor", *wxWHITE);
+    const wxColour commentBg = nativeOr("CommentBgColor", panelBg);
     m_grid->SetBackgroundColour2(propertyBg, commentBg);
-    if (!m_skin.GetString("GridLineColor", "", section).empty()) {
-        m_grid->SetGridLineColor(NativeColour(m_skin.GetRgbColour("GridLineColor", 0, section)),
-                                 true);
+    const int gridLine = m_skin.GetInt("GridLineColor", kSkinColourNotSet, section);
+    if (gridLine == kSkinColourNotSet) {
+        m_grid->SetGridLineColor(wxColour(125, 156, 197), false);
+    } else {
+        m_grid->SetGridLineColor(NativeColour(static_cast<std::uint32_t>(gridLine)), true);
     }
     auto picture = [&](const char* key) {
         return LoadSkinPicture(m_skin.GetString(key, "", section));
@@ -50,6 +52,7 @@ bool CSideBarWnd::OnSkinChanged(const std::string& skinDir) {
     const wxFont font = MakeSkinFont(m_skin.GetFont(section));
     const wxColour titleColour = NativeColour(m_skin.GetRgbColour("TitleTextColor", 0, section));
     const wxColour textColour = NativeColour(m_skin.GetRgbColour("TextColor", 0, section));
+    m_grid->SetTextColour2(textColour);
     m_profileLabel->SetFont(titleFont);
     m_profileLabel->SetTextColour(titleColour);
     for (ImLabel* label :
@@ -225,6 +228,8 @@ void CSideBarWnd::OnWorkModeChanged(int mode) {
     m_profileSelector->Show(!burn);
     m_discType->Show(burn);
     m_profileSelector->Enable(!burn);
+    // A burn disc type stands for a fixed system profile: there is nothing of the user's to save.
+    m_saveButton->Enable(!burn);
     if (burn) {
         SelectDiscType(GetDiscType());
     } else {

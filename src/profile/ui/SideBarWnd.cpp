@@ -4,6 +4,7 @@
 #include "resources/Language.h"
 #include "shell/AppConfig.h"
 #include "shell/MainHub.h"
+#include "skin/NativeControls.h"
 #include "skin/SkinControls.h"
 #include "skin/SkinLabels.h"
 #include "skin/SkinPicture.h"
@@ -60,6 +61,7 @@ CSideBarWnd::CSideBarWnd(wxWindow* parent)
       m_self(std::make_shared<CSideBarWnd*>(this)) {
     g_SideBar = this;
     CreateControls();
+    FollowSkinColoursBelow(this);
     BindEvents();
     m_grid->ShowComment(true);
     m_grid->EnableToolTips(true);

@@ -109,6 +109,9 @@ public:
     ParameterGrid* Grid() const { return m_grid; }
     // The width the selector's drop-down needs for its widest entry.
     int DropDownWidth() const { return m_dropDownWidth; }
+    // The width that shows the longest profile name whole in the closed selector; the main
+    // window grants it when it has room to spare.
+    int NeededWidth() const;
 
     // Tests answer the name dialog here instead of a modal loop (true for OK).
     using NameDialogRunner = std::function<bool(CSaveProfileDlg&)>;

@@ -7,6 +7,7 @@
 #include "rip/ui/RipTexts.h"
 #include "shell/MainHub.h"
 #include "skin/ListCtrl.h"
+#include "skin/NativeControls.h"
 #include "skin/SkinGeometry.h"
 #include "skin/SkinLabels.h"
 #include "skin/WindowTranslation.h"
@@ -90,6 +91,7 @@ CDRipDlg::CDRipDlg(wxWindow* parent, std::unique_ptr<platform::IDiscDevice> devi
       m_progressTimer(this, kProgressTimer),
       m_alive(std::make_shared<CDRipDlg*>(this)) {
     CreateControls();
+    FollowSkinColoursBelow(this);
     BindEvents();
     g_RipDlg = this;
     ReadSettings();
@@ -395,9 +397,7 @@ bool CDRipDlg::OnSkinChanged(const std::string& skinDir) {
                                     : NativeColour(m_skin.GetRgbColour("TextColorDown", 0, section)));
     const int headerColour = m_skin.GetInt("HeaderBgColor", -1, section);
     if (auto* header = dynamic_cast<ImHeaderCtrl*>(HeaderOf(*m_list)); header && headerColour != -1) {
-        header->SetColors(wxSystemSettings::GetColour(wxSYS_COLOUR_3DHIGHLIGHT),
-                          wxSystemSettings::GetColour(wxSYS_COLOUR_3DSHADOW),
-                          NativeColour(static_cast<std::uint32_t>(headerColour)), m_cellText);
+        header->SetSkinColors(NativeColour(static_cast<std::uint32_t>(headerColour)), m_cellText);
     }
     m_list->SetHeaderPicture(LoadSkinPicture(m_skin.GetString("HeaderBack", "", section)),
                              m_skin.GetInt("HeaderBgMode", 0, section), m_skin.GetInt("HeadBgTopSplitter", 0, section),

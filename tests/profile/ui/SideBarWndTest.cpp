@@ -4,6 +4,7 @@
 #include "../../support/WxTestApp.h"
 #include "profile/ui/SideBarWnd.h"
 
+#include "profile/grid/PropertyTree.h"
 #include "profile/ui/ParameterGrid.h"
 #include "profile/ui/SaveProfileDlg.h"
 #include "resources/Language.h"
@@ -283,6 +284,37 @@ TEST_F(SideBarTest, LanguageChangeRenamesEntriesAndKeepsTheSelection) {
     g_Language.Init(m_base, "English");
 }
 
+// The grid's three colours are native numbers in which 255 stands for "not set": a skin that
+// sets one gets it byte for byte, one that writes 255 gets the built-in colour.
+TEST_F(SideBarTest, GridColoursOfTheSkinAreNativeWith255AsNotSet) {
+    std::vector<std::pair<std::string, std::string>> entries{
+        {"profile/", ""},
+        {"profile/mp3.pf", PfText("MP3 Audio", "mp3", "mp3", kEntries, "IsSysProfile = yes\r\n")},
+        {"skin/", ""},
+        {"skin/Dark/", ""},
+        {"skin/Dark/skin.ini",
+         "[Main]\r\nName=Dark\r\n[SideBar]\r\nPropertyBgColor=0x00332211\r\n"
+         "GridLineColor=255\r\nCommentBgColor=0x00665544\r\n"},
+        {"skin/Plain/", ""},
+        {"skin/Plain/skin.ini",
+         "[Main]\r\nName=Plain\r\n[SideBar]\r\nPropertyBgColor=255\r\n"
+         "GridLineColor=0x00C59C7D\r\n"},
+    };
+    ClosePackage(SystemPath("x.pf"));
+    WritePackage(entries);
+    Start();
+    PropertiesCtrl* grid = m_bar->Grid();
+    m_bar->OnSkinChanged(Logical("Skin\\Dark"));
+    EXPECT_EQ(grid->Tree()->RowBackground(), wxColour(0x11, 0x22, 0x33));
+    grid->SetGridLineColor(wxColour(125, 156, 197), false);
+    const wxColour builtIn = grid->GetGridLineColor();
+    m_bar->OnSkinChanged(Logical("Skin\\Dark"));
+    EXPECT_EQ(grid->GetGridLineColor(), builtIn) << "255: the built-in line colour";
+    m_bar->OnSkinChanged(Logical("Skin\\Plain"));
+    EXPECT_EQ(grid->Tree()->RowBackground(), *wxWHITE) << "255: white";
+    EXPECT_EQ(grid->GetGridLineColor(), wxColour(0x7D, 0x9C, 0xC5)) << "set: taken exactly";
+}
+
 class SideBarSets : public SideBarTest {
 protected:
     void SetUp() override {
@@ -385,10 +417,14 @@ TEST_F(SideBarSets, ModesAndTheBitRateOfLosslessFormats) {
     m_hub.mode = 2;
     m_bar->OnWorkModeChanged(2);
     EXPECT_TRUE(m_bar->FindWindow(sidebar::kAlbum)->IsShown()) << "audio CD: the disc group";
+    EXPECT_FALSE(m_bar->FindWindow(sidebar::kSaveProfile)->IsEnabled()) << "nothing to save";
     EXPECT_FALSE(m_bar->Grid()->IsShown());
     m_bar->SelectDiscType(1);
     EXPECT_TRUE(m_bar->Grid()->IsShown()) << "advanced again for an MP3 CD";
     EXPECT_EQ(StateLine("profile"), "MP3 Audio  (*.mp3)");
+    m_hub.mode = 0;
+    m_bar->OnWorkModeChanged(0);
+    EXPECT_TRUE(m_bar->FindWindow(sidebar::kSaveProfile)->IsEnabled());
 }
 
 }  // namespace
