@@ -3,7 +3,9 @@
 // take. Run by medialist_bench.sh under Xvfb.
 //
 //   medialist_add_bench FOLDER BASEDIR ROWS
-// prints "add_ms N", "rows N", "rss_kib_per_row N" for ROWS rows of one file.
+// prints "add_ms N", "rows N", then for ROWS rows of one file "heap_kib_per_row N" (bytes the
+// allocator hands out, which is what a row costs) and "rss_kib_per_row N" (resident pages,
+// which also move with what the allocator keeps or returns, so they vary from run to run).
 
 #include "medialist/ui/MediaListWnd.h"
 #include "medialist/ui/OutputPanelWnd.h"
@@ -12,6 +14,8 @@
 #include <wx/app.h>
 #include <wx/frame.h>
 #include <wx/init.h>
+
+#include <malloc.h>
 
 #include <chrono>
 #include <cstdio>
@@ -30,6 +34,8 @@ long ResidentKiB() {
     }
     return 0;
 }
+
+std::size_t HeapBytesInUse() { return mallinfo2().uordblks; }
 
 }  // namespace
 
@@ -68,10 +74,13 @@ int main(int argc, char** argv) {
             break;
         }
         const long before = ResidentKiB();
+        const std::size_t heapBefore = HeapBytesInUse();
         for (int i = 0; i < rows; ++i) {
             list->AddFile(one, -1);
         }
         const long after = ResidentKiB();
+        const double heap = static_cast<double>(HeapBytesInUse() - heapBefore);
+        std::printf("heap_kib_per_row %.2f\n", heap / 1024.0 / rows);
         std::printf("rss_kib_per_row %.2f\nrss_mib_total %.1f\n",
                     static_cast<double>(after - before) / rows, (after - before) / 1024.0);
         frame->Destroy();

@@ -35,4 +35,4 @@ probe=$(median < "$work/probe.log")
 awk -v l="$list" -v p="$probe" 'BEGIN {
   printf "add 1000 files: list %.0f ms (%.0f files/s), acprobe %.0f ms (%.0f files/s), list/probe %.2f\n",
          l, 1000 / (l / 1000), p, 1000 / (p / 1000), l / p }'
-"$bin/medialist_add_bench" "$work/files" "$bin" 10000 | grep rss
+"$bin/medialist_add_bench" "$work/files" "$bin" 10000 | grep -E 'heap|rss'

@@ -52,7 +52,9 @@ struct ParameterDef {
 
 // One parameter of a set.
 struct ParameterRecord {
-    std::string name;
+    // Always a key of the parameter table, which lives as long as the program: every row of a
+    // long list holds a set, so the name is not copied into each.
+    std::string_view name;
     std::uint32_t flags = 0;  // PARAM_READONLY or 0; every other flag is asked of the table
     std::string defaultValue;
     std::string value;

@@ -149,7 +149,7 @@ bool Profile::Load(std::string path) {
         FieldSplitter splitter(',', '"');
         splitter.Split(fields);
         ParameterRecord record;
-        record.name = key;
+        record.name = def.key;
         const std::size_t count = splitter.FieldCount();
         if (count >= 1) record.flags = ParseFlagField(CleanField(splitter, 1));
         if (count >= 2) record.defaultValue = CleanField(splitter, 2);
@@ -255,7 +255,7 @@ bool SaveProfile(const Profile& source, const ParameterSet& working, std::string
     for (const ParameterRecord& fileRecord : source.FileRecords()) {
         if (fileRecord.name.empty()) break;
         const std::string value(TrimBlanks(working.GetValue(fileRecord.name)));
-        WriteIniString("Parameter", fileRecord.name.c_str(),
+        WriteIniString("Parameter", std::string(fileRecord.name).c_str(),
                        FormatParameterEntry(fileRecord, value).c_str(), path);
     }
     return true;

@@ -121,7 +121,7 @@ void ApplyRipRow(SetList sets, const RipRowValues& row) {
     for (ParameterSet* set : sets) {
         std::vector<std::string> keys;
         for (const ParameterRecord& record : set->Records())
-            keys.push_back(record.name);
+            keys.emplace_back(record.name);
         for (const std::string& key : keys) {
             std::string value;
             if (key == "acodec") {

@@ -23,17 +23,18 @@ namespace ac {
 inline constexpr int kListHeaderCheckMessage = 0x542;
 wxDECLARE_EVENT(EVT_XLIST_HEADER_CHECK, wxCommandEvent);
 
+// Members ordered by size: a list of 10,000 rows holds 60,000 of these.
 struct XListCell {
     std::string text;
+    std::string progressFormat;  // "%d%%" when empty
     wxColour crText;
     wxColour crBackground;
-    bool bEnabled = true;
     int nCheckedState = -1;  // -1 no box, 0 unchecked, 1 checked
-    bool bProgress = false;
     int nProgressPercent = 0;
-    bool bShowProgressText = true;
-    std::string progressFormat;  // "%d%%" when empty
     int nImage = -1;
+    bool bEnabled = true;
+    bool bProgress = false;
+    bool bShowProgressText = true;
 };
 
 struct XListColumn {

@@ -13,8 +13,9 @@ using Strings = std::vector<std::string>;
 // A set made of records directly, as a row's set would be after loading.
 class FakeSet : public ac::ParameterSet {
 public:
-    FakeSet& Add(std::string name, std::string value, ac::ValueList values = {}) {
-        m_records.push_back({std::move(name), 0, "", std::move(value), values});
+    // Names are literals, as table keys are: a record keeps only a view of its name.
+    FakeSet& Add(std::string_view name, std::string value, ac::ValueList values = {}) {
+        m_records.push_back({name, 0, "", std::move(value), values});
         return *this;
     }
     std::string GetName() const override { return "fake"; }

@@ -42,7 +42,7 @@ TEST_F(ProfileLoad, FileWinsOverTableAndUnknownKeysVanish) {
     EXPECT_EQ(profile->GetValue("title"), "");
     // Table order, whatever the file's order; ab is not in the file, so it is not in the set.
     Strings names;
-    for (const auto& record : profile->Records()) names.push_back(record.name);
+    for (const auto& record : profile->Records()) names.emplace_back(record.name);
     EXPECT_EQ(names, (Strings{"t", "title", "ab", "ar"}));
     // What the file said stays apart from what the table filled in.
     EXPECT_EQ(profile->FileRecords()[0].defaultValue, "");

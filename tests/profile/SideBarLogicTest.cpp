@@ -11,9 +11,10 @@ namespace {
 // A set made of records directly, as a row's set would be after loading.
 class FakeSet : public ac::ParameterSet {
 public:
-    FakeSet& Add(std::string name, std::string value, std::uint32_t flags = 0,
+    // Names are literals, as table keys are: a record keeps only a view of its name.
+    FakeSet& Add(std::string_view name, std::string value, std::uint32_t flags = 0,
                  ac::ValueList values = {}) {
-        m_records.push_back({std::move(name), flags, "", std::move(value), values});
+        m_records.push_back({name, flags, "", std::move(value), values});
         return *this;
     }
     std::string GetName() const override { return "fake"; }
