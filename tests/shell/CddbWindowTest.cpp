@@ -10,6 +10,7 @@
 
 #include <gtest/gtest.h>
 
+#include <cstdio>
 #include <filesystem>
 #include <fstream>
 #include <sstream>
@@ -99,6 +100,8 @@ TEST_F(CddbWindowTest, CddbChoosesTheSecondOfThreeMatchesAndNamesTheDisc) {
     EXPECT_TRUE(Has(Field(state, "cddbmessage"), "210 misc 14001403"))
         << Field(state, "cddbmessage");
     EXPECT_EQ(Field(state, "cddbaction"), "Get all track's name");
+    std::printf("lookup from the CDDB command to OK enabled: %s ms\n",
+                Field(state, "cddbms").c_str());
     program.Send("cddbok");
     state = program.WaitFor([](const State& s) { return RowName(s, 2) == "Three"; });
     EXPECT_EQ(RowName(state, 0), "One");

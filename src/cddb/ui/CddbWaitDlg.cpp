@@ -170,6 +170,7 @@ CCddbWaitDlg::~CCddbWaitDlg() {
 int CCddbWaitDlg::ShowModal() {
     m_record.Clear();
     m_ok->Disable();
+    m_opened = std::chrono::steady_clock::now();
     StartWorker();
     CCddbWaitDlg* outer = s_shown;
     s_shown = this;
@@ -276,7 +277,7 @@ std::string CCddbWaitDlg::Describe() const {
     }
     return "cddbaction=" + m_action->GetLabel().utf8_string() + "\ncddbmessage=" + message +
            "\ncddbok=" + (m_ok->IsEnabled() ? "1" : "0") + "\ncddbdone=" + (m_done ? "1" : "0") +
-           "\n";
+           "\ncddbms=" + std::to_string(m_lookupMs) + "\n";
 }
 
 void RunLookupDialog(wxWindow* parent, LookupJob job, cddb::CDDiscInfo& out) {
