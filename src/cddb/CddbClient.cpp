@@ -116,6 +116,8 @@ std::string HostSettingText(std::string_view host, int port) {
 }
 
 bool ParseMatchLine(std::string_view line, CddbMatch& out) {
+    // A reply was always read as a C string: nothing behind a NUL byte counts.
+    line = line.substr(0, line.find('\0'));
     if (const std::size_t crlf = line.find("\r\n"); crlf != std::string_view::npos) {
         line = line.substr(0, crlf);
     } else if (const std::size_t lf = line.find('\n'); lf != std::string_view::npos) {
@@ -154,6 +156,7 @@ MatchResult ParseMatchList(std::string_view body, std::vector<CddbMatch>& matche
                            std::vector<std::string>& replyLines) {
     matches.clear();
     replyLines.clear();
+    body = body.substr(0, body.find('\0'));
     if (body.size() < 3) {
         return MatchResult::ProtocolError;
     }
