@@ -337,7 +337,8 @@ TEST_F(AcripTest, UsageErrorsAndDiscsThatCannotBeRippedExit2WithAReason) {
         {{"--device", dir / "records/0e001003.cddb"}, "holds no audio disc"},
         {{"--device", image.cuePath, "--profile", "no such profile"},
          "no profile named no such profile"},
-        {{"--server", "localhost"}, "unknown option --server"},
+        {{"--server", "localhost"}, "--server and --choose go with --cddb"},
+        {{"--cddb", "--choose", "0"}, "--choose 0: not a match number"},
         {{"--out"}, "--out needs a value"},
     };
     for (const Case& c : cases) {
