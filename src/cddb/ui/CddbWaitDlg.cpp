@@ -227,6 +227,8 @@ int CCddbWaitDlg::AskChoice(const std::vector<std::string>& rows) {
 
 void CCddbWaitDlg::WorkerEnded(bool found, const cddb::CDDiscInfo& record, bool enableOk) {
     m_done = true;
+    m_lookupMs =
+        std::chrono::duration<double, std::milli>(std::chrono::steady_clock::now() - m_opened).count();
     if (found)
         m_record = record;
     if (m_worker.joinable())
