@@ -19,6 +19,7 @@ for src in "$top"/tests/fuzz/fuzz_*.cpp; do
   mkdir -p "$corpus"
   case "$name" in
     fuzz_ini|fuzz_settings) seeds="$top/../shared/corpus/ini" ;;
+    fuzz_cddb_matches|fuzz_cddb_match_line|fuzz_cddb_batch) seeds="$top/tests/data/cddb/seeds" ;;
     fuzz_language) seeds="$top/data/lang" ;;
     fuzz_cue_sheet|fuzz_ctt_cue) seeds="$top/../shared/corpus/cue" ;;
     fuzz_xmcd) seeds="$top/../shared/corpus/xmcd" ;;

@@ -106,9 +106,10 @@ bool SeekComment(LineReader& lines, std::string_view marker) {
     return false;
 }
 
-// Freedb promises ISO-8859-1 for entries that are not UTF-8; every byte maps to the code point
-// of its own value.
-std::string DecodeBody(std::string_view bytes) {
+}  // namespace
+
+// Every ISO-8859-1 byte maps to the code point of its own value.
+std::string DecodeServerText(std::string_view bytes) {
     if (ac::IsValidUtf8(bytes)) {
         return ac::SanitizeUtf8(bytes);
     }
@@ -125,6 +126,8 @@ std::string DecodeBody(std::string_view bytes) {
     }
     return text;
 }
+
+namespace {
 
 // The leading comments: the xmcd mark, the frame offsets and the disc length.
 EntryResult ParseDiscComments(LineReader& lines, CddbEntry& out) {
@@ -217,11 +220,15 @@ EntryResult ParseDiscTitle(LineReader& lines, CddbEntry& out) {
     }
     // Servers asked for protocol level 5 or above, and every xmcd file on disk, carry DYEAR
     // and DGENRE between DTITLE and the track titles. Read as any other line they would end
-    // the track titles before the first one; the year and genre the record keeps come from
-    // EXTD.
-    while (!lines.AtEnd() && (IsKeyLine(lines.Line(), "DYEAR", keyLine) ||
-                              IsKeyLine(lines.Line(), "DGENRE", keyLine))) {
-        lines.Next();
+    // the track titles before the first one.
+    for (; !lines.AtEnd(); lines.Next()) {
+        if (IsKeyLine(lines.Line(), "DYEAR", keyLine)) {
+            out.discYear = TrimAsciiSpace(keyLine.value);
+        } else if (IsKeyLine(lines.Line(), "DGENRE", keyLine)) {
+            out.discGenre = TrimAsciiSpace(keyLine.value);
+        } else {
+            break;
+        }
     }
     return EntryResult::Ok;
 }
@@ -338,7 +345,7 @@ EntryResult ParseEntry(std::string_view body, CddbEntry& out) {
     if (status < 210 || status > 219) {
         return EntryResult::BadStatus;
     }
-    const std::string text = DecodeBody(body);
+    const std::string text = DecodeServerText(body);
     LineReader lines(text);
     lines.Next();  // the status line
     for (auto step :
@@ -356,6 +363,7 @@ void EntryToDiscInfo(std::string_view category, const CddbEntry& entry, CDDiscIn
     info.album = entry.title;
     info.genre = category;
     info.year = "Unknown";
+    bool genreFromExtd = false;
     for (const std::string& whole : entry.extendedDiscData) {
         // The old buffer looked at 259 characters of a line; cut where a character starts.
         const std::string line = FitText(whole, kTitleCapacity);
@@ -371,7 +379,16 @@ void EntryToDiscInfo(std::string_view category, const CddbEntry& entry, CDDiscIn
         // character on.
         if (Contains(line, "GENRE")) {
             info.genre = SkipCharacters(line, 8);
+            genreFromExtd = true;
         }
+    }
+    // Level 4 servers put year and genre into EXTD only; from level 5 on they come as DYEAR
+    // and DGENRE, and EXTD may say nothing of them.
+    if (info.year == "Unknown" && !entry.discYear.empty()) {
+        info.year = entry.discYear;
+    }
+    if (!genreFromExtd && !entry.discGenre.empty()) {
+        info.genre = entry.discGenre;
     }
     const std::size_t count =
         std::min(entry.trackTitles.size(), static_cast<std::size_t>(kMaxTracks));

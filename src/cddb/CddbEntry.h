@@ -27,6 +27,9 @@ struct CddbEntry {
     std::uint32_t discId = 0;
     std::string artist;
     std::string title;
+    // DYEAR and DGENRE, which servers send from protocol level 5 on; empty below that.
+    std::string discYear;
+    std::string discGenre;
     std::vector<std::string> trackTitles;
     std::vector<std::string> extendedDiscData;  // EXTD split at its line feeds
     std::vector<std::string> extendedTrackData;
@@ -59,10 +62,16 @@ const char* EntryResultText(EntryResult result);
 // entries that are not UTF-8. `out` is reset first and holds what was parsed up to a failure.
 EntryResult ParseEntry(std::string_view body, CddbEntry& out);
 
+// Server text as UTF-8: the bytes as they are where they are valid UTF-8, else read as
+// ISO-8859-1, which is what servers promise for replies that are not UTF-8 (levels 4 and 5
+// differ from server to server).
+std::string DecodeServerText(std::string_view bytes);
+
 // Fills the flat record from an entry and the category of the chosen match: artist and album
 // from DTITLE, the track titles in order, and year and genre from the extended disc data (the
 // last EXTD line decides the year: "Unknown" unless it holds "YEAR"; a line holding "GENRE"
-// gives the genre from its ninth character on). Capacities are applied.
+// gives the genre from its ninth character on). Where EXTD leaves the year unknown, DYEAR gives
+// it; where no EXTD line names a genre, DGENRE gives it. Capacities are applied.
 void EntryToDiscInfo(std::string_view category, const CddbEntry& entry, CDDiscInfo& info);
 
 }  // namespace cddb

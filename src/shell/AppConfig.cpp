@@ -54,6 +54,8 @@ constexpr std::array kKeys = {
     I("timeout", 20, "CDDB time-out in seconds"),
     I("format", 0, "CDDB reply format choice"),
     I("cddborder", 0, "order of CDDB sources"),
+    S("cddb_email", "", "CDDB hello as user@host; empty uses the login and host names"),
+    I("cddb_proto", 4, "CDDB protocol level asked for, 4 to 6"),
     I("ejectcd", 0, "eject the disc when a rip is done"),
     I("lockcd", 0, "preference shown and stored; ripping always locks the tray"),
     S("cdimages", "", "disc images listed as drives after the devices, separated by ';'"),

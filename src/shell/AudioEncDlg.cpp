@@ -1,5 +1,7 @@
 #include "shell/AudioEncDlg.h"
 
+#include "cddb/ui/CddbWaitDlg.h"
+
 #include "medialist/ui/MediaListWnd.h"
 #include "medialist/ui/OutputPanelWnd.h"
 #include "panels/ProgramDialogs.h"
@@ -416,6 +418,12 @@ bool CAudioEncDlg::RunStopLogic() {
 }
 
 void CAudioEncDlg::OnClose(wxCloseEvent& event) {
+    // A lookup's dialogs run nested event loops over this window: they end first, and the
+    // lookup asks for the close again once they have unwound.
+    if (CCddbWaitDlg::EndOpenLookup() && event.CanVeto()) {
+        event.Veto();
+        return;
+    }
     if (!RunStopLogic() && event.CanVeto()) {
         event.Veto();
         return;

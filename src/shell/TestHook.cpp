@@ -1,5 +1,7 @@
 #include "shell/TestHook.h"
 
+#include "cddb/ui/CddbSelectDlg.h"
+#include "cddb/ui/CddbWaitDlg.h"
 #include "rip/ui/RipPanel.h"
 
 #include "shell/AudioEncDlg.h"
@@ -185,6 +187,15 @@ void CTestHook::DescribePanels(const CAudioEncDlg& dlg, std::ostream& out) {
         out << "riprunning=" << (g_RipDlg->Driver().IsRunning() ? 1 : 0) << "\n";
         out << "riploadms=" << g_RipDlg->LastLoadMs() << "\n";
         out << "ripdiscid=" << std::hex << g_RipDlg->DiscId() << std::dec << "\n";
+        out << "cddblookup=" << (g_RipDlg->IsLookupOpen() ? 1 : 0) << "\n";
+    }
+    if (CCddbWaitDlg* lookup = CCddbWaitDlg::Shown()) {
+        out << lookup->Describe();
+    }
+    if (CCddbSelectDlg* select = CCddbSelectDlg::Shown()) {
+        out << "cddbselect=";
+        for (const std::string& row : select->Rows()) out << row << "|";
+        out << "\n";
     }
     if (g_OutputPanel != nullptr) {
         out << "outdir=" << g_OutputPanel->GetOutputDirectory() << "\n";
@@ -310,6 +321,16 @@ void CTestHook::RunScriptCommand(CAudioEncDlg& dlg, const std::string& line) {
         int row = 0;
         in >> row;
         g_RipDlg->ClickRow(row);
+    } else if (verb == "cddbchoose" && CCddbSelectDlg::Shown() != nullptr) {
+        int row = 0;
+        in >> row;
+        CCddbSelectDlg::Shown()->ChooseRow(row);
+    } else if ((verb == "cddbok" || verb == "cddbcancel") && CCddbWaitDlg::Shown() != nullptr) {
+        if (verb == "cddbok") {
+            CCddbWaitDlg::Shown()->PressOk();
+        } else {
+            CCddbWaitDlg::Shown()->PressCancel();
+        }
     } else if (verb == "tab") {
         int mode = 0;
         in >> mode;

@@ -3,6 +3,7 @@
 // Skipped while acrip or ctt is not built.
 
 #include "platform/SettingsStore.h"
+#include "support/CddbTestServer.h"
 #include "support/DiscImages.h"
 #include "support/RunTool.h"
 #include "support/TempDir.h"
@@ -167,6 +168,68 @@ TEST_F(AcripTest, ListShowsTheDiscIdTracksAndRecordOfTheFirstImageThatHoldsADisc
         << unknown.out;
 }
 
+// A record as a CDDB server keeps it, for the disc of the gapped image (14001403).
+std::string ServerRecord(const std::string& artist, const std::string& album,
+                         const std::vector<std::string>& titles) {
+    std::string text =
+        "# xmcd\r\n#\r\n# Track frame offsets:\r\n#\t150\r\n#\r\n# Disc length: 20 seconds\r\n"
+        "#\r\n# Submitted via: testsuite 1.0\r\n#\r\nDISCID=14001403\r\nDTITLE=" +
+        artist + " / " + album + "\r\nDYEAR=2001\r\n";
+    for (std::size_t i = 0; i < titles.size(); ++i)
+        text += "TTITLE" + std::to_string(i) + "=" + titles[i] + "\r\n";
+    return text + "EXTD=\r\n";
+}
+
+TEST_F(AcripTest, CddbLooksTheDiscUpTakesTheChosenMatchAndNamesItOfflineLater) {
+    const test::DiscImage gapped =
+        test::WriteDiscImage(dir.Path(), "gapped", test::ThreeTrackSpecs(150));
+    {
+        test::CddbTestServer server;
+        int n = 0;
+        for (const char* category : {"rock", "misc", "jazz"}) {
+            const std::string artist = "Band " + std::to_string(++n);
+            server.AddRecord(category, 0x14001403, artist + " / Album",
+                             ServerRecord(artist, "Album", {"One", "Two / Too", "Three"}));
+        }
+        const test::ToolResult found =
+            Acrip({"--device", gapped.cuePath, "--cddb", "--server",
+                   "127.0.0.1:" + std::to_string(server.Port()), "--choose", "2"});
+        ASSERT_EQ(found.exitCode, 0) << found.out << found.err;
+        EXPECT_TRUE(Contains(found.out, "211 Found inexact matches")) << found.out;
+        EXPECT_TRUE(Contains(found.out, "*2: misc 14001403 Band 2 / Album")) << found.out;
+        EXPECT_TRUE(Contains(found.out, "Artist:  Band 2\nAlbum:   Album\nYear:    2001\n"))
+            << found.out;
+        EXPECT_TRUE(Contains(found.out, "  2  00:09  Two / Too\n")) << found.out;
+        ASSERT_EQ(server.Requests().size(), 2u);
+        EXPECT_TRUE(Contains(server.Requests()[1], "cmd=cddb+read+misc+14001403&hello="));
+
+        // A match number past the list takes the first, and says so.
+        const test::ToolResult past =
+            Acrip({"--device", gapped.cuePath, "--cddb", "--server",
+                   "127.0.0.1:" + std::to_string(server.Port()), "--choose", "7"});
+        EXPECT_EQ(past.exitCode, 0) << past.err;
+        EXPECT_TRUE(Contains(past.err, "only 3 matches")) << past.err;
+        // Back to the second, which the offline listing below must show.
+        EXPECT_EQ(Acrip({"--device", gapped.cuePath, "--cddb", "--server",
+                         "127.0.0.1:" + std::to_string(server.Port()), "--choose", "2"})
+                      .exitCode,
+                  0);
+    }
+    // The server is gone: the record keeps the names.
+    const test::ToolResult list = Acrip({"--device", gapped.cuePath, "--list"});
+    EXPECT_TRUE(Contains(list.out, "Artist:  Band 2\n")) << list.out;
+    EXPECT_TRUE(Contains(list.out, "  1  00:07  One\n")) << list.out;
+
+    // A server that refuses: exit 1, the connect text, and the disc kept for the batch.
+    const test::ToolResult refused =
+        Acrip({"--device", gapped.cuePath, "--cddb", "--server", "127.0.0.1:1"});
+    EXPECT_EQ(refused.exitCode, 1);
+    EXPECT_TRUE(Contains(refused.out, "Could not connect to the CDDB HTTP server 127.0.0.1"))
+        << refused.out;
+    EXPECT_TRUE(fs::exists(dir / "records/CDDB_Batch.txt"));
+    EXPECT_EQ(Acrip({"--choose", "2"}).exitCode, 2) << "--choose goes with --cddb";
+}
+
 TEST_F(AcripTest, AskedTracksRipSampleExactToWavAndFlacIntoArtistAndAlbumFolders) {
     const std::string folder = "The Testers/Test Album/";
     const test::ToolResult wav = Acrip(
@@ -274,7 +337,8 @@ TEST_F(AcripTest, UsageErrorsAndDiscsThatCannotBeRippedExit2WithAReason) {
         {{"--device", dir / "records/0e001003.cddb"}, "holds no audio disc"},
         {{"--device", image.cuePath, "--profile", "no such profile"},
          "no profile named no such profile"},
-        {{"--server", "localhost"}, "unknown option --server"},
+        {{"--server", "localhost"}, "--server and --choose go with --cddb"},
+        {{"--cddb", "--choose", "0"}, "--choose 0: not a match number"},
         {{"--out"}, "--out needs a value"},
     };
     for (const Case& c : cases) {

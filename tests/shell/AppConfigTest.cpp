@@ -112,7 +112,9 @@ TEST(ConfigKeyTableTest, NamesAreUniqueAndServerEntriesResolve) {
     for (const ConfigKey& key : ConfigKeys()) {
         EXPECT_TRUE(names.insert(key.name).second) << key.name;
     }
-    EXPECT_EQ(names.size(), 41u);  // the forty of the settings key, and the disc images
+    // The forty of the settings key, the disc images, and the CDDB identity (cddb_email and
+    // cddb_proto).
+    EXPECT_EQ(names.size(), 43u);
     ASSERT_NE(FindConfigKey("addr12"), nullptr);
     EXPECT_STREQ(FindConfigKey("addr12")->name, "addr");
     EXPECT_EQ(FindConfigKey("addrx"), nullptr);

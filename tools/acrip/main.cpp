@@ -2,7 +2,7 @@
 // program's own rip driver, profiles, naming scheme, settings and local disc records.
 //
 //   acrip [--device DEV|IMAGE.cue|IMAGE.toc] [--profile NAME|PATH] [--out DIR] [--tracks 1,3-5]
-//         [--list]
+//         [--list] [--cddb [--server HOST[:PORT]] [--choose N]]
 //
 // Exit status: 0 when every asked track ripped (or the table was listed), 1 when some failed,
 // 2 for a usage error or when there is no audio disc to rip, 130 after Ctrl-C or SIGTERM (the
@@ -11,6 +11,8 @@
 #include "ConsoleRip.h"
 #include "ProfileLookup.h"
 
+#include "cddb/BatchFile.h"
+#include "cddb/CddbLookup.h"
 #include "cddb/DiscFile.h"
 #include "convert/OutputNaming.h"
 #include "platform/DiscDevice.h"
@@ -57,7 +59,7 @@ constexpr int kUsageError = 2;
 
 constexpr const char* kUsage =
     "usage: acrip [--device DEV|IMAGE.cue|IMAGE.toc] [--profile NAME|PATH] [--out DIR]\n"
-    "             [--tracks 1,3-5] [--list]\n";
+    "             [--tracks 1,3-5] [--list] [--cddb [--server HOST[:PORT]] [--choose N]]\n";
 
 struct Options {
     std::string device;
@@ -65,6 +67,9 @@ struct Options {
     std::string outputDirectory;
     std::set<int> tracks;  // empty: every audio track
     bool list = false;
+    bool cddb = false;
+    std::string server;  // HOST[:PORT]; empty: the setting remotecddb
+    int choose = 0;      // 1-based match of a list; 0: the first
     bool help = false;
 };
 
@@ -83,6 +88,11 @@ void Help(const std::string& base) {
         "                       DIR/artist/album/, named by the naming scheme\n"
         "  --tracks LIST        the tracks to rip, as 1,3-5 (default: every audio track)\n"
         "  --list               show the disc id, the tracks and the disc's record; rip nothing\n"
+        "  --cddb               look the disc up on the CDDB server, print its answer and the\n"
+        "                       names, and keep them in the local record folder; rip nothing\n"
+        "  --server HOST[:PORT] the CDDB server (default: the setting remotecddb, else\n"
+        "                       gnudb.gnudb.org:80)\n"
+        "  --choose N           take match N when the server offers several (default: the first)\n"
         "  --help               this text\n\n"
         "Exit status: 0 when every track ripped, 1 when some did not, 2 for a usage error or no\n"
         "audio disc, 130 when stopped (Ctrl-C); a stopped rip leaves no partial file.\n\n"
@@ -128,6 +138,19 @@ std::string ParseArguments(int argc, char** argv, Options& options) {
             options.help = true;
         } else if (word == "--list") {
             options.list = true;
+        } else if (word == "--cddb") {
+            options.cddb = true;
+        } else if (word == "--choose") {
+            if (i + 1 >= argc)
+                return word + " needs a value";
+            const std::string value = argv[++i];
+            options.choose = std::atoi(value.c_str());
+            if (options.choose < 1 || value.find_first_not_of("0123456789") != std::string::npos)
+                return "--choose " + value + ": not a match number such as 2";
+        } else if (word == "--server") {
+            if (i + 1 >= argc)
+                return word + " needs a value";
+            options.server = argv[++i];
         } else if (word == "--device" || word == "--profile" || word == "--out" ||
                    word == "--tracks") {
             if (i + 1 >= argc)
@@ -150,6 +173,8 @@ std::string ParseArguments(int argc, char** argv, Options& options) {
             return "unexpected argument " + word;
         }
     }
+    if (!options.cddb && (options.choose != 0 || !options.server.empty()))
+        return "--server and --choose go with --cddb";
     return {};
 }
 
@@ -262,6 +287,80 @@ bool PrepareOutputFolder(const Options& options, AppConfig& config, std::string&
     return true;
 }
 
+// The lookup told on the terminal: every answer of the server as it came, and the matches
+// numbered when there are several.
+class ConsoleLookup : public cddb::ILookupObserver {
+public:
+    explicit ConsoleLookup(int choose) : m_choose(choose) {}
+    void ShowAction(const std::string& text) override { std::printf("== %s\n", text.c_str()); }
+    void ShowMessage(const std::string& text) override {
+        std::fputs(text.c_str(), stdout);
+        if (!text.empty() && text.back() != '\n')
+            std::fputc('\n', stdout);
+        std::fflush(stdout);
+    }
+    int ChooseMatch(const std::vector<std::string>& rows) override {
+        for (std::size_t i = 0; i < rows.size(); ++i)
+            std::printf("%s%zu: %s\n", static_cast<int>(i) + 1 == std::max(m_choose, 1) ? "*" : " ",
+                        i + 1, rows[i].c_str());
+        if (m_choose > static_cast<int>(rows.size())) {
+            std::fprintf(stderr, "acrip: there are only %zu matches; taking the first\n",
+                         rows.size());
+            return 0;
+        }
+        return std::max(m_choose, 1) - 1;
+    }
+
+private:
+    int m_choose;
+};
+
+// "host", "host:8080"; the port is 80 unless given.
+cddb::CddbHost ServerOption(const std::string& text) {
+    cddb::CddbHost host;
+    const std::size_t colon = text.rfind(':');
+    host.host = text.substr(0, colon);
+    if (colon != std::string::npos) {
+        const int port = std::atoi(text.c_str() + colon + 1);
+        host.port = port > 0 && port < 65536 ? port : cddb::kDefaultCddbPort;
+    }
+    return host;
+}
+
+// Looks the disc up, prints the answer, keeps the record. 0 when the disc was named.
+int LookUpDisc(const Options& options, AppConfig& config, const Disc& disc, std::uint32_t discId,
+               const std::string& recordFolder) {
+    cddb::LookupSettings settings;
+    settings.host = options.server.empty() ? cddb::ParseHostSetting(config.GetString("remotecddb"))
+                                           : ServerOption(options.server);
+    settings.timeoutMs = static_cast<unsigned>(std::max(1, config.GetInt("timeout"))) * 1000;
+    settings.email = config.GetString("cddb_email");
+    settings.protocolLevel = config.GetInt("cddb_proto");
+    settings.batchFile = cddb::BatchFilePath(recordFolder);
+    ConsoleLookup observer(options.choose);
+    cddb::CDDiscInfo info;
+    if (!cddb::LookupDisc(settings, ToDiscToc(disc.table), observer, nullptr, info) ||
+        info.trackCount == 0) {
+        std::fprintf(stderr, "acrip: the CDDB server %s did not name disc %s\n",
+                     (settings.host.host.empty() ? std::string(cddb::kDefaultCddbServer)
+                                                 : settings.host.host)
+                         .c_str(),
+                     cddb::FormatDiscId(discId).c_str());
+        return 1;
+    }
+    if (info.genre.empty())
+        info.genre = "Other";
+    if (!cddb::SaveDiscFile(recordFolder, cddb::FormatDiscId(discId), info,
+                            config.GetInt("format"))) {
+        std::fprintf(stderr, "acrip: cannot write %s\n",
+                     cddb::DiscFilePath(recordFolder, discId).c_str());
+        return 1;
+    }
+    PrintTable(disc, discId, BuildTrackRows(disc.table, disc.drive, &info), &info, recordFolder);
+    std::printf("Stored:  %s\n", cddb::DiscFilePath(recordFolder, discId).c_str());
+    return 0;
+}
+
 void InstallStopHandlers() {
     struct sigaction stop {};
     stop.sa_handler = OnStopSignal;
@@ -290,7 +389,8 @@ int main(int argc, char** argv) {
 
     console::LoosePackage loose;
     std::unique_ptr<ParameterSet> profile;
-    if (!options.list && !(profile = console::FindProfile(options.profile, base, loose))) {
+    if (!options.list && !options.cddb &&
+        !(profile = console::FindProfile(options.profile, base, loose))) {
         std::fprintf(stderr, "acrip: no profile named %s\n", options.profile.c_str());
         return kUsageError;
     }
@@ -303,6 +403,8 @@ int main(int argc, char** argv) {
 
     const std::uint32_t discId = DiscIdOf(disc.table);
     const std::string recordFolder = cddb::LocalCddbFolder(config.GetString("localcddb"));
+    if (options.cddb)
+        return LookUpDisc(options, config, disc, discId, recordFolder);
     cddb::CDDiscInfo record;
     const bool known = cddb::LoadDiscFile(recordFolder, discId, record);
     const std::vector<TrackRow> rows =

@@ -379,11 +379,12 @@ bool CDRipDlg::IsCommandEnabled(int commandId) {
     bool selected = false;
     for (int row = 0; row < RowCount() && !selected; ++row) selected = m_list->IsSelected(row);
     switch (commandId) {
-        case ripcmd::kCddb:
+        case ripcmd::kCddb: return rows && !m_running && !m_lookupOpen;
+        // The batch needs no disc: its records are in the file.
+        case ripcmd::kBatchQuery: return !m_running && !m_lookupOpen;
         case ripcmd::kReadLocal:
         case ripcmd::kReadRemote:
-        case ripcmd::kReadWinamp:
-        case ripcmd::kBatchQuery: return rows && !m_running;
+        case ripcmd::kReadWinamp: return rows && !m_running;
         case ripcmd::kRipChecked: return rows && (!m_running || m_paused);
         case ripcmd::kPauseChecked: return rows && m_running && !m_paused;
         case ripcmd::kStopChecked: return rows && (m_running || m_paused);
@@ -433,11 +434,11 @@ bool CDRipDlg::OnCommand(int commandId) {
         case ripcmd::kRenameKey: BeginRename(); return true;
         case ripcmd::kConfigureToAll: ConfigureToAll(); return true;
         case ripcmd::kAddDiscImage: AddDiscImage(); return true;
-        case ripcmd::kCddb:
+        case ripcmd::kCddb: LookupThread(); return true;
+        case ripcmd::kBatchQuery: OnBatchQuery(); return true;
         case ripcmd::kReadLocal:
         case ripcmd::kReadRemote:
-        case ripcmd::kReadWinamp:
-        case ripcmd::kBatchQuery: return true;  // the lookups come with the network client
+        case ripcmd::kReadWinamp: return true;  // kept in the menus; no source behind them
         default: break;
     }
     if (commandId >= ripcmd::kFirstMenuDrive && commandId <= ripcmd::kLastMenuDrive) {

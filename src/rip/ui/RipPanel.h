@@ -10,6 +10,7 @@
 // Thread contract: UI thread, except the drive poll, which runs on the panel's worker and posts
 // its answer back.
 
+#include "cddb/CddbLookup.h"
 #include "cddb/DiscInfo.h"
 #include "platform/DiscDevice.h"
 #include "profile/ParameterSet.h"
@@ -145,6 +146,14 @@ public:
     // Fills the boxes and the names from a record (a lookup's answer, or the local cache).
     void ApplyRecord(const cddb::CDDiscInfo& record);
     bool Renamed() const { return m_renamed; }
+    // ---- CDDB ----
+    // The CDDB button and command: the renamed-names question, then the "CDDB Response"
+    // dialog over the lookup worker, then the names into the list and the .cddb record. It runs
+    // on the UI thread, as every wx dialog must; the network work is the dialog's worker's.
+    void LookupThread();
+    // "CDDB Batch Query": every record of CDDB_Batch.txt asked again, each answer stored.
+    void OnBatchQuery();
+    bool IsLookupOpen() const { return m_lookupOpen; }
     void BeginRename();
     XListCtrl* List() const { return m_list; }
     // What a user does with the keyboard, for the window tests: a box typed and left, a name
@@ -215,6 +224,7 @@ private:
     void FitColumns();
     void JoinWorker();
     void RefreshDriverSettings();
+    cddb::LookupSettings ReadLookupSettings() const;
 
     std::unique_ptr<platform::IDiscDevice> m_device;
     IRipModeHost* m_modeHost = nullptr;
@@ -242,6 +252,7 @@ private:
     cddb::CDDiscInfo m_record;
     std::uint32_t m_discId = 0xFFFFFFFF;
     bool m_renamed = false;
+    bool m_lookupOpen = false;
     bool m_trayOpen = false;
     bool m_running = false;
     bool m_paused = false;

@@ -1,5 +1,6 @@
 // The rip panel's window side: controls, skin, layout, the status cells, renaming in place, the
 // disc boxes, the mouse and the timers.
+#include "cddb/ui/CddbWaitDlg.h"
 #include "medialist/ui/IconButton.h"
 #include "resources/Language.h"
 #include "rip/TrackTable.h"
@@ -107,6 +108,7 @@ CDRipDlg::~CDRipDlg() {
     *m_alive = nullptr;
     m_alive.reset();
     JoinWorker();
+    JoinAbandonedLookups();
     m_driver.AbandonRun();
     if (g_RipDlg == this) g_RipDlg = nullptr;
 }
