@@ -56,6 +56,12 @@ public:
 
     // A drive loaded by hand: the next poll must not undo it.
     void SkipNextPoll() { m_skipNextPoll = true; }
+    // The list was filled by hand (a drive chosen, an image added): a disc is loaded, so no
+    // later poll may load "the first disc" over it and wipe what the user typed meanwhile.
+    void MarkLoaded() {
+        m_discLoaded = true;
+        m_discSeen = true;
+    }
 
     bool DiscSeen() const { return m_discSeen; }
     bool DiscLoaded() const { return m_discLoaded; }

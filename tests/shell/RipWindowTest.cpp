@@ -13,6 +13,7 @@
 #include <filesystem>
 #include <fstream>
 #include <sstream>
+#include <thread>
 
 namespace {
 
@@ -156,6 +157,22 @@ TEST_F(RipWindowTest, ADiscImageLoadsNamedFromItsRecordAndRipsCheckedTracksSampl
     fs::rename(image.cuePath, image.cuePath + ".gone");
     state = program.WaitFor([](const State& s) { return s.count("riprow0") == 0; });
     EXPECT_EQ(state.count("riprow0"), 0u);
+}
+
+// The disc boxes keep what the user types at once after adding an image: no poll that was
+// already under way loads "the first disc" over the list a second later.
+TEST_F(RipWindowTest, WhatIsTypedRightAfterAddingAnImageStays) {
+    ac::test::WriteSettings(home, "last_run_function=dword:1\nOutputCDDir=sz:" + out +
+                                      "\nlocalcddb=sz:" + (home / "cddb") + "\n");
+    Program program(home);
+    program.WaitShown();
+    program.Send("ripimage " + image.cuePath);
+    program.Send("ripbox 0 Harbour Band");
+    State state = program.WaitFor([](const State& s) { return Field(s, "ripboxes").rfind("Harbour Band|", 0) == 0; });
+    ASSERT_EQ(Field(state, "ripboxes").rfind("Harbour Band|", 0), 0u) << Field(state, "ripboxes");
+    std::this_thread::sleep_for(3s);
+    state = program.WaitFor([](const State& s) { return s.count("riprow2") > 0; });
+    EXPECT_EQ(Field(state, "ripboxes").rfind("Harbour Band|", 0), 0u) << Field(state, "ripboxes");
 }
 
 }  // namespace

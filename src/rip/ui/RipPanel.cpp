@@ -113,6 +113,8 @@ void CDRipDlg::LoadDriveContents(int driveIndex) {
     if (driveIndex < 0 || driveIndex >= static_cast<int>(m_drives.size()) || m_driver.IsRunning()) return;
     const auto started = std::chrono::steady_clock::now();
     m_watcher.SkipNextPoll();
+    m_watcher.MarkLoaded();
+    m_loadTimer.Stop();
     ClearDisc();
     SetCurrentDrive(driveIndex);
     platform::DiscTable table;
@@ -124,6 +126,7 @@ void CDRipDlg::LoadDriveContents(int driveIndex) {
 void CDRipDlg::LoadFirstDisc() {
     m_loadTimer.Stop();
     if (m_driver.IsRunning()) return;
+    if (!m_rows.empty()) return;
     DriveWatcher::FirstDisc first = m_watcher.LoadFirstDisc(*m_device, m_drives);
     if (first.driveIndex < 0) return;
     ClearDisc();
@@ -240,7 +243,9 @@ void CDRipDlg::StartPoll() {
 }
 
 void CDRipDlg::OnPollDone(DriveWatcher::PollResult result) {
-    if (result.startLoadTimer && !m_loadTimer.IsRunning()) m_loadTimer.StartOnce(1000);
+    // A poll that began before the user loaded a drive by hand may still report a new disc; a
+    // list that shows one already stays as it is.
+    if (result.startLoadTimer && m_rows.empty() && !m_loadTimer.IsRunning()) m_loadTimer.StartOnce(1000);
     if (result.emptySelected && !m_rows.empty()) ClearDisc();
     // Another disc in the same drive since the last poll (swapped quickly, or an image file
     // replaced): its own tracks, not the old list.
