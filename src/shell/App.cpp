@@ -170,7 +170,10 @@ wxIMPLEMENT_APP_NO_MAIN(CAudioEncApp);
 
 int main(int argc, char** argv) {
     TakeCommandLine(argc, argv);
-    const int code = wxEntry(argc, argv);
+    // The arguments are files, taken above as bytes; wx and GTK would try to read them as text
+    // and as their own switches.
+    int wxArgc = 1;
+    const int code = wxEntry(wxArgc, argv);
     // A start that handed its files to the running copy did what was asked of it.
     return g_handedOver ? 0 : code;
 }
