@@ -310,6 +310,9 @@ public:
         }
         return std::max(m_choose, 1) - 1;
     }
+    void ShowEntryProblem(const std::string& reason) override {
+        std::fprintf(stderr, "acrip: %s\n", reason.c_str());
+    }
 
 private:
     int m_choose;
