@@ -62,7 +62,21 @@ EncodingDriver::EncodingDriver(IMediaList& list, IDriverHost& host, DriverConfig
       m_namer(std::move(namer)),
       m_builder(std::move(builder)),
       m_freeSpace(VolumeFreeBytes),
-      m_afterConvertAction(m_config.afterConvertAction) {}
+      m_afterConvertAction(m_config.afterConvertAction),
+      m_maxProcesses(m_config.maxProcesses),
+      m_maxRunningProcesses(m_config.maxRunningProcesses) {}
+
+void EncodingDriver::UpdateSettings(int maxProcesses, int maxRunningProcesses, int playSound,
+                                    const std::string& soundPath) {
+    m_maxProcesses = maxProcesses;
+    m_maxRunningProcesses = maxRunningProcesses;
+    {
+        std::lock_guard lock(m_soundMutex);
+        m_config.playSound = playSound;
+        m_config.soundPath = soundPath;
+    }
+    Wake();
+}
 
 EncodingDriver::~EncodingDriver() {
     Stop();
@@ -132,7 +146,7 @@ bool EncodingDriver::RunPass() {
         JobStatus status = item->Status();
         if (status == JobStatus::Waiting)
             StartRow(row, *item, proceed, lastOutput);
-        else if (status == JobStatus::Pending && m_runningCount < m_config.maxRunningProcesses)
+        else if (status == JobStatus::Pending && m_runningCount < m_maxRunningProcesses)
             ResumeRow(row, *item);
     }
     m_list.Unlock();
@@ -157,7 +171,7 @@ void EncodingDriver::StartRow(int row, MediaItem& item, bool& proceed, std::stri
         m_list.RefreshRow(row);
         return;
     }
-    if (m_processCount >= m_config.maxProcesses || m_runningCount >= m_config.maxRunningProcesses)
+    if (m_processCount >= m_maxProcesses || m_runningCount >= m_maxRunningProcesses)
         return;
 
     CEncodeProcess* child = item.process.load();
@@ -507,8 +521,15 @@ double EncodingDriver::GetRunTotalSeconds() {
 
 void EncodingDriver::OnRunFinished() {
     m_runPending = 0;
-    if (m_config.playSound)
-        m_host.PlaySound(m_config.soundPath);
+    int playSound = 0;
+    std::string soundPath;
+    {
+        std::lock_guard lock(m_soundMutex);
+        playSound = m_config.playSound;
+        soundPath = m_config.soundPath;
+    }
+    if (playSound)
+        m_host.PlaySound(soundPath);
     int action = m_afterConvertAction.load();
     if (action >= 0 && action <= 3)
         m_host.StartAfterRunAction(action);

@@ -1,3 +1,4 @@
+#include "shell/Preferences.h"
 #include "shell/AudioEncDlg.h"
 
 #include "cddb/ui/CddbWaitDlg.h"
@@ -504,6 +505,11 @@ void CAudioEncDlg::OnCommand(wxCommandEvent& event) {
             LoadModeMenu(GetWorkMode());
             return;
         }
+        case cmd::kPreferences: {
+            CPreferencesSheet sheet(this, [this] { OnPreferencesApplied(); });
+            sheet.ShowModal();
+            return;
+        }
         case cmd::kContents:
             OpenHelpPage(GetAppConfig().GetBaseDirectory() + "/help/Default.htm", this);
             return;
@@ -518,6 +524,20 @@ void CAudioEncDlg::OnCommand(wxCommandEvent& event) {
             // Commands of the list panels arrive here once those panels exist.
             event.Skip();
             return;
+    }
+}
+
+void CAudioEncDlg::OnPreferencesApplied() {
+    m_afterConvert = GetAppConfig().GetInt("afterconvert");
+    if (m_convert) {
+        m_convert->SetAfterConvertAction(m_afterConvert);
+        m_convert->ReloadSettings();
+    }
+    if (m_rip) {
+        m_rip->SetAfterRunAction(m_afterConvert);
+    }
+    if (g_RipDlg != nullptr) {
+        g_RipDlg->ReadSettings();
     }
 }
 

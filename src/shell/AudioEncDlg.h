@@ -50,6 +50,8 @@ public:
     // Files named on the command line of this start or handed over by a later one: they join
     // the convert list, and the window comes to the front.
     void OpenFiles(const std::vector<std::string>& paths);
+    // After the preferences wrote settings: every running copy reads them again.
+    void OnPreferencesApplied();
     int GetWorkMode() const;
 
     // IMainHub: how the panels reach each other (AudioEncHub.cpp).

@@ -105,6 +105,14 @@ void CConvertMode::Start() {
     m_driver->Start();
 }
 
+void CConvertMode::ReloadSettings() {
+    if (m_driver) {
+        const DriverConfig config = ReadDriverConfig();
+        m_driver->UpdateSettings(config.maxProcesses, config.maxRunningProcesses, config.playSound,
+                                 config.soundPath);
+    }
+}
+
 void CConvertMode::Shutdown() {
     m_alive.reset();
     if (!m_driver) {
