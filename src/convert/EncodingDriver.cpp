@@ -64,10 +64,14 @@ EncodingDriver::EncodingDriver(IMediaList& list, IDriverHost& host, DriverConfig
       m_freeSpace(VolumeFreeBytes),
       m_afterConvertAction(m_config.afterConvertAction),
       m_maxProcesses(m_config.maxProcesses),
-      m_maxRunningProcesses(m_config.maxRunningProcesses) {}
+      m_maxRunningProcesses(m_config.maxRunningProcesses),
+      m_slowdown(m_config.slowdown),
+      m_idle(m_config.idle) {}
 
 void EncodingDriver::UpdateSettings(int maxProcesses, int maxRunningProcesses, int playSound,
-                                    const std::string& soundPath) {
+                                    const std::string& soundPath, bool slowdown, bool idle) {
+    m_slowdown = slowdown;
+    m_idle = idle;
     m_maxProcesses = maxProcesses;
     m_maxRunningProcesses = maxRunningProcesses;
     {
@@ -205,6 +209,7 @@ void EncodingDriver::StartRow(int row, MediaItem& item, bool& proceed, std::stri
     if (m_sweptDirectories.insert(directory).second)
         platform::SweepStalePartFiles(directory);
     child->SetCurrentDirectory(m_config.toolDirectory);
+    child->SetBackgroundPriority(m_slowdown, m_idle);
     child->SetOutputPath(item.outputPath);
     if (!child->Launch("\"" + m_config.toolPath + "\" " + commandText)) {
         item.outputHold.Release();
