@@ -40,6 +40,7 @@ constexpr std::uint32_t kNumberRangeId = 0xC186;
 constexpr std::uint32_t kMustSelectId = 0xC187;
 constexpr std::uint32_t kCddbEmailId = 0xC188;
 constexpr std::uint32_t kCddbProtoId = 0xC189;
+constexpr std::uint32_t kApplyTextId = 0xC18A;
 constexpr std::size_t kMaxAllScheme = 259;
 
 std::string Text(std::uint32_t id) {
@@ -111,23 +112,20 @@ public:
         auto* top = new wxBoxSizer(wxVERTICAL);
 
         wxStaticBoxSizer* process = Group(this, 1050, WxText(164));
-        m_maxProcesses = new wxTextCtrl(process->GetStaticBox(), 1019,
-                                        wxString::Format("%d", config.GetInt("max_processes")));
-        m_maxRunning =
-            new wxTextCtrl(process->GetStaticBox(), 1020,
-                           wxString::Format("%d", config.GetInt("max_running_processes")));
-        process->Add(
-            Row(new wxStaticText(process->GetStaticBox(), 1048, WxText(163)), m_maxProcesses), 0,
-            wxEXPAND | wxALL, 4);
-        process->Add(
-            Row(new wxStaticText(process->GetStaticBox(), 1049, WxText(162)), m_maxRunning), 0,
-            wxEXPAND | wxALL, 4);
+        m_maxProcesses =
+            new wxTextCtrl(this, 1019, wxString::Format("%d", config.GetInt("max_processes")));
+        m_maxRunning = new wxTextCtrl(
+            this, 1020, wxString::Format("%d", config.GetInt("max_running_processes")));
+        process->Add(Row(new wxStaticText(this, 1048, WxText(163)), m_maxProcesses), 0,
+                     wxEXPAND | wxALL, 4);
+        process->Add(Row(new wxStaticText(this, 1049, WxText(162)), m_maxRunning), 0,
+                     wxEXPAND | wxALL, 4);
         top->Add(process, 0, wxEXPAND | wxALL, 6);
 
         wxStaticBoxSizer* overwrite = Group(this, 1051, WxText(167));
-        m_overwrite = new wxRadioButton(overwrite->GetStaticBox(), 1052, WxText(168),
-                                        wxDefaultPosition, wxDefaultSize, wxRB_GROUP);
-        m_keep = new wxRadioButton(overwrite->GetStaticBox(), 1053, WxText(169));
+        m_overwrite = new wxRadioButton(this, 1052, WxText(168), wxDefaultPosition, wxDefaultSize,
+                                        wxRB_GROUP);
+        m_keep = new wxRadioButton(this, 1053, WxText(169));
         (config.GetInt("output_file_overwrite") != 0 ? m_overwrite : m_keep)->SetValue(true);
         overwrite->Add(m_overwrite, 0, wxALL, 3);
         overwrite->Add(m_keep, 0, wxALL, 3);
@@ -139,9 +137,8 @@ public:
         auto* actions = new wxBoxSizer(wxHORIZONTAL);
         const int action = config.GetInt("afterconvert");
         for (int i = 0; i < 5; ++i) {
-            m_actions[i] =
-                new wxRadioButton(after->GetStaticBox(), 1090 + i, kActions[i], wxDefaultPosition,
-                                  wxDefaultSize, i == 0 ? wxRB_GROUP : 0);
+            m_actions[i] = new wxRadioButton(this, 1090 + i, kActions[i], wxDefaultPosition,
+                                             wxDefaultSize, i == 0 ? wxRB_GROUP : 0);
             m_actions[i]->SetValue(i == action);
             actions->Add(m_actions[i], 0, wxALL, 3);
         }
@@ -155,8 +152,8 @@ public:
         top->Add(Row(m_playSound, m_soundPath, m_soundButton), 0, wxEXPAND | wxLEFT | wxRIGHT, 6);
 
         wxStaticBoxSizer* background = Group(this, 1098, "BackGround");
-        m_slowdown = new wxCheckBox(background->GetStaticBox(), 1099, "Slowdown Priority");
-        m_idle = new wxCheckBox(background->GetStaticBox(), 1100, "Idle Convert");
+        m_slowdown = new wxCheckBox(this, 1099, "Slowdown Priority");
+        m_idle = new wxCheckBox(this, 1100, "Idle Convert");
         m_slowdown->SetValue(config.GetInt("slowdown") != 0);
         m_idle->SetValue(config.GetInt("idle") != 0);
         auto* boxes = new wxBoxSizer(wxHORIZONTAL);
@@ -273,7 +270,7 @@ public:
         top->Add(m_alsoConverter, 0, wxALL, 6);
 
         wxStaticBoxSizer* illegal = Group(this, 1153, "Illegal Characters Replacement");
-        wxWindow* box = illegal->GetStaticBox();
+        wxWindow* box = this;
         m_delete = new wxRadioButton(box, 1157, "Automatically Delete", wxDefaultPosition,
                                      wxDefaultSize, wxRB_GROUP);
         m_replaceIllegal = new wxRadioButton(box, 1158, "Replacement:");
@@ -370,9 +367,9 @@ public:
                  0, wxEXPAND | wxLEFT | wxRIGHT | wxBOTTOM, 6);
 
         wxStaticBoxSizer* format = Group(this, 1109, "CDDB Format");
-        m_windows = new wxRadioButton(format->GetStaticBox(), 1110, "Windows Format",
-                                      wxDefaultPosition, wxDefaultSize, wxRB_GROUP);
-        m_unix = new wxRadioButton(format->GetStaticBox(), 1111, "Unix Format");
+        m_windows = new wxRadioButton(this, 1110, "Windows Format", wxDefaultPosition,
+                                      wxDefaultSize, wxRB_GROUP);
+        m_unix = new wxRadioButton(this, 1111, "Unix Format");
         (config.GetInt("format") != 0 ? m_unix : m_windows)->SetValue(true);
         auto* formats = new wxBoxSizer(wxHORIZONTAL);
         formats->Add(m_windows, 0, wxALL, 3);
@@ -733,6 +730,13 @@ CPreferencesSheet::CPreferencesSheet(wxWindow* parent, std::function<void()> app
     Create(parent, wxID_ANY, WxText(kSheetTitleId), wxDefaultPosition, wxDefaultSize,
            wxDEFAULT_DIALOG_STYLE | wxRESIZE_BORDER);
     CreateButtons(wxOK | wxCANCEL | wxAPPLY);
+    // The buttons speak the program's language, not the locale's.
+    const std::pair<int, std::uint32_t> buttons[] = {
+        {wxID_OK, 1}, {wxID_CANCEL, 2}, {wxID_APPLY, kApplyTextId}};
+    for (const auto& [id, text] : buttons) {
+        if (wxWindow* button = FindWindow(id))
+            button->SetLabel(WxText(text));
+    }
     wxBookCtrlBase* book = GetBookCtrl();
     m_pages = {new CPropGeneral(book), new CPropFile(book), new CPropCDDB(book),
                new CPropCDRip(book), new CPropCDBurn(book)};
