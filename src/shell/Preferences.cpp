@@ -726,7 +726,7 @@ bool CPropPage::SetControl(int id, const std::string& value) {
 CPreferencesSheet* CPreferencesSheet::s_shown = nullptr;
 
 CPreferencesSheet::CPreferencesSheet(wxWindow* parent, std::function<void()> applied)
-    : m_applied(std::move(applied)) {
+    : m_applied(std::move(applied)), m_started(std::chrono::steady_clock::now()) {
     Create(parent, wxID_ANY, WxText(kSheetTitleId), wxDefaultPosition, wxDefaultSize,
            wxDEFAULT_DIALOG_STYLE | wxRESIZE_BORDER);
     CreateButtons(wxOK | wxCANCEL | wxAPPLY);
@@ -758,6 +758,14 @@ CPreferencesSheet::CPreferencesSheet(wxWindow* parent, std::function<void()> app
                 EndModal(wxID_OK);
         },
         wxID_OK);
+    Bind(wxEVT_IDLE, [this](wxIdleEvent& event) {
+        if (m_openMs == 0 && IsShownOnScreen()) {
+            m_openMs = std::chrono::duration<double, std::milli>(std::chrono::steady_clock::now() -
+                                                                 m_started)
+                           .count();
+        }
+        event.Skip();
+    });
     s_shown = this;
 }
 
@@ -800,6 +808,7 @@ void CPreferencesSheet::UpdateApplyButton() {
 std::string CPreferencesSheet::Describe() const {
     std::ostringstream out;
     out << "prefpage=" << GetBookCtrl()->GetSelection() << "\n";
+    out << "prefopenms=" << m_openMs << "\n";
     for (std::size_t i = 0; i < m_pages.size(); ++i) {
         out << "pref" << i << "=" << (m_pages[i]->IsModified() ? "*" : "") << m_pages[i]->Describe()
             << "\n";
