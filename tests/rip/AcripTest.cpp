@@ -101,8 +101,9 @@ protected:
         // "ABE": 01-Artist-Title, so a file named so proves the scheme setting was read.
         SetString("allscheme", "E,AE,AEB,ABE,AHE,AEH");
         SetInt("scheme", 3);
-        image = test::WriteDiscImage(dir.Path(), "disc", test::ThreeTrackSpecs(),
-                                     test::ImageOptions{.writeToc = true});
+        test::ImageOptions withToc;
+        withToc.writeToc = true;
+        image = test::WriteDiscImage(dir.Path(), "disc", test::ThreeTrackSpecs(), withToc);
         std::ofstream(dir / "records/0e001003.cddb")
             << "[CDINFO]\r\nARITIST=The Testers\r\nALBUM=Test Album\r\nGENRE=rock\r\nYEAR=2004\r\n"
                "[MUSIC]\r\nTotal=3\r\nTrack00=First Light\r\nTrack01=Second\r\nTrack02=Third\r\n";
