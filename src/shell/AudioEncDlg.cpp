@@ -4,6 +4,7 @@
 
 #include "medialist/ui/MediaListWnd.h"
 #include "medialist/ui/OutputPanelWnd.h"
+#include "panels/PlayerWnd.h"
 #include "panels/ProgramDialogs.h"
 #include "panels/StatusWnd.h"
 #include "platform/DiscDevice.h"
@@ -17,6 +18,7 @@
 #include "shell/ConvertMode.h"
 #include "shell/MenuTables.h"
 #include "shell/MessageBoxes.h"
+#include "shell/PlayerLists.h"
 #include "shell/ProgramIcon.h"
 #include "shell/RipMode.h"
 #include "convert/RowParameters.h"
@@ -162,7 +164,10 @@ void CAudioEncDlg::CreatePanels() {
     m_panels[SideBar] = new CSideBarWnd(this);
     m_panels[MediaList] = new CMediaListWnd(this);
     m_panels[Output] = new COutputPanelWnd(this);
-    m_panels[Player] = new ImSkinPanel(this, 1008, "PlayerPanel");
+    auto* player = new CPlayerWnd(this);
+    player->SetModeList(0, &ConvertPreviewList());
+    player->SetModeList(1, &RipPreviewList());
+    m_panels[Player] = player;
     m_panels[Rip] = new CDRipDlg(this, platform::MakeDiscDevice());
     // The context menu of the list still to come; the media and rip lists open their own.
     const std::pair<Panel, int> contextMenus[] = {{Creator, kBurnListContextMenu}};
@@ -481,6 +486,9 @@ void CAudioEncDlg::OnCommand(wxCommandEvent& event) {
         if (GetWorkMode() == 0) {
             m_convert->OnCommand(id);
         }
+        return;
+    }
+    if (g_PlayerWnd != nullptr && g_PlayerWnd->OnCommand(id)) {
         return;
     }
     switch (id) {
