@@ -4,6 +4,7 @@
 
 #include "medialist/ui/MediaListWnd.h"
 #include "medialist/ui/OutputPanelWnd.h"
+#include "panels/FileInfoWnd.h"
 #include "panels/PlayerWnd.h"
 #include "panels/ProgramDialogs.h"
 #include "panels/StatusWnd.h"
@@ -179,6 +180,7 @@ void CAudioEncDlg::CreatePanels() {
         });
     }
     m_panels[Player]->SetSize(-1, kPlayerHeight);
+    new CFileInfoWnd(this);  // hidden until Show File Information; goes with this window
 }
 
 int CAudioEncDlg::GetWorkMode() const {
@@ -287,6 +289,10 @@ void CAudioEncDlg::OnInitMenuPopup(wxMenu* menu) {
         }
     }
     ApplyEnableRules(*menu);
+    if (wxMenuItem* info = menu->FindChildItem(CFileInfoWnd::kCommandId);
+        info != nullptr && info->IsCheckable() && g_FileInfoWnd != nullptr) {
+        info->Check(g_FileInfoWnd->IsShown());
+    }
     for (int id = cmd::kAfterFirst; id <= cmd::kAfterLast; ++id) {
         if (wxMenuItem* item = menu->FindChildItem(id)) {
             item->Check(kAfterConvertOfCommand[id - cmd::kAfterFirst] == m_afterConvert);
@@ -304,6 +310,9 @@ void CAudioEncDlg::OnLanguageChanged() {
 void CAudioEncDlg::OnLanguageCommand() {
     LoadModeMenu(GetWorkMode());
     OnLanguageChanged();
+    if (g_FileInfoWnd != nullptr) {
+        g_FileInfoWnd->OnLanguageChanged();
+    }
     // Skins may carry language variants of their pictures and keys.
     g_Skin.SetSkin(g_Skin.GetSkinName());
     Refresh();
@@ -474,6 +483,13 @@ void CAudioEncDlg::OnCommand(wxCommandEvent& event) {
         }
         if (m_rip) {
             m_rip->SetAfterRunAction(m_afterConvert);
+        }
+        return;
+    }
+    // Show File Information serves every mode: the window shows whatever row it was given.
+    if (id == CFileInfoWnd::kCommandId && g_FileInfoWnd != nullptr) {
+        if (IsCommandEnabled(id)) {
+            g_FileInfoWnd->ShowInfo(true);
         }
         return;
     }

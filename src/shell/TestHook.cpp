@@ -9,6 +9,7 @@
 #include "convert/RowParameters.h"
 #include "medialist/ui/MediaListWnd.h"
 #include "medialist/ui/OutputPanelWnd.h"
+#include "panels/FileInfoWnd.h"
 #include "panels/PlayerWnd.h"
 #include "panels/StatusWnd.h"
 #include "profile/ParameterSet.h"
@@ -209,6 +210,11 @@ void CTestHook::DescribePanels(const CAudioEncDlg& dlg, std::ostream& out) {
     }
     if (g_PlayerWnd != nullptr) {
         out << g_PlayerWnd->DescribeState();
+    }
+    if (g_FileInfoWnd != nullptr) {
+        out << "fileinfo_shown=" << (g_FileInfoWnd->IsShown() ? 1 : 0) << "\n";
+        out << "fileinfo_bytes=" << g_FileInfoWnd->PageText().size() << "\n";
+        out << "fileinfo_ms=" << g_FileInfoWnd->LastShowMs() << "\n";
     }
     std::string boxes;
     for (std::string text : ShownBoxes()) {
