@@ -406,6 +406,7 @@ void Engine::OnAudioFrame(AVFrame* frame, double seconds, std::uint64_t generati
             static_cast<std::size_t>(std::max(0.0, (m_trimTo - seconds) * m_outputRate + 0.5));
         chunk.readFrames = std::min(cut, chunk.Frames());
         m_trimTo = -1;
+        m_source->SetCatchingUp(false);
     }
     std::lock_guard lock(m_mutex);
     if (generation != m_generation) {
@@ -473,6 +474,9 @@ void Engine::OnVideoFrame(AVFrame* frame, double seconds, std::uint64_t generati
             return;
         }
         m_pictureTrimTo = -1;
+        if (!m_source->HasAudio()) {
+            m_source->SetCatchingUp(false);
+        }
         if (m_heldPicture != nullptr && m_heldPicture->width > 0 &&
             seconds > m_seekTarget + 0.001) {
             Picture held;
@@ -485,6 +489,14 @@ void Engine::OnVideoFrame(AVFrame* frame, double seconds, std::uint64_t generati
         }
         if (m_heldPicture != nullptr) {
             av_frame_unref(m_heldPicture);
+        }
+    }
+    {
+        // A picture already behind the clock (the decoder catching up after a seek) would be
+        // skipped when shown: it is not scaled either.
+        std::lock_guard lock(m_mutex);
+        if (m_audioClock && !m_pictures.empty() && seconds < ClockLocked() - 0.1) {
+            return;
         }
     }
     Picture picture;
@@ -524,17 +536,30 @@ void Engine::DecodeLoop() {
             m_seekTarget = target;
             m_trimTo = seek ? target : -1;
             m_pictureTrimTo = seek ? target : -1;
+            m_source->SetCatchingUp(seek && m_source->HasVideo());
             if (m_heldPicture != nullptr) {
                 av_frame_unref(m_heldPicture);
             }
             lock.lock();
             continue;
         }
-        if (m_decoderEnded || QueuesFullLocked()) {
+        // Pictures put off by a seek are decoded first, reading on only as far as the sound
+        // needs to keep playing meanwhile.
+        const bool backlog = m_source->HasBacklog();
+        if (m_decoderEnded || (QueuesFullLocked() && !backlog)) {
             m_changed.wait(lock);
             continue;
         }
+        const bool soundEnough =
+            static_cast<double>(m_audioFrames) / m_outputRate >= kAudioLowSeconds;
         lock.unlock();
+        if (backlog && soundEnough) {
+            m_source->DecodeBacklog([this, generation](AVFrame* frame, double seconds) {
+                OnVideoFrame(frame, seconds, generation);
+            });
+            lock.lock();
+            continue;
+        }
         const bool more = m_source->Step(
             [this, generation](AVFrame* frame, double seconds) {
                 OnAudioFrame(frame, seconds, generation);

@@ -5,6 +5,7 @@
 #include <algorithm>
 #include <climits>
 #include <cmath>
+#include <deque>
 
 extern "C" {
 #include <libavcodec/avcodec.h>
@@ -28,6 +29,9 @@ struct FrameFreer {
 };
 
 using CodecPtr = std::unique_ptr<AVCodecContext, CodecCloser>;
+
+// Ten seconds of pictures at 30 per second: longer than the key frame distance of common files.
+constexpr std::size_t kMostPutOff = 300;
 
 CodecPtr OpenDecoder(const AVStream* stream, int threads) {
     const AVCodec* codec = avcodec_find_decoder(stream->codecpar->codec_id);
@@ -103,17 +107,38 @@ public:
             }
         }
         m_draining = false;
+        m_putOff.clear();
         m_nextAudio = seconds;
+    }
+
+    void SetCatchingUp(bool catchingUp) override {
+        m_catchingUp = catchingUp && m_video != nullptr;
+        if (m_video && (m_catchingUp || m_putOff.empty())) {
+            m_video->skip_frame = m_catchingUp ? AVDISCARD_NONREF : AVDISCARD_DEFAULT;
+        }
+    }
+
+    bool HasBacklog() const override { return !m_catchingUp && !m_putOff.empty(); }
+    void DecodeBacklog(const FrameSink& onVideo) override {
+        if (HasBacklog()) {
+            DecodePutOff(onVideo);
+        }
     }
 
     bool Step(const FrameSink& onAudio, const FrameSink& onVideo) override {
         if (m_draining) {
             return false;
         }
+        if (!m_catchingUp && !m_putOff.empty()) {
+            DecodePutOff(onVideo);
+        }
         const int read = av_read_frame(m_input.get(), m_packet.get());
         if (read < 0) {
             // End of file or a cut-off one: whatever the decoders still hold comes out.
             m_draining = true;
+            while (!m_putOff.empty()) {
+                DecodePutOff(onVideo);
+            }
             Decode(m_audio.get(), m_audioIndex, nullptr, onAudio);
             Decode(m_video.get(), m_videoIndex, nullptr, onVideo);
             return false;
@@ -121,7 +146,16 @@ public:
         if (m_packet->stream_index == m_audioIndex) {
             Decode(m_audio.get(), m_audioIndex, m_packet.get(), onAudio);
         } else if (m_packet->stream_index == m_videoIndex) {
-            Decode(m_video.get(), m_videoIndex, m_packet.get(), onVideo);
+            // A sound that never reaches the target (it ends before the pictures do) must
+            // not hold the pictures back without bound.
+            if (m_putOff.size() >= kMostPutOff) {
+                m_catchingUp = false;
+            }
+            if (m_audio && (m_catchingUp || !m_putOff.empty())) {
+                m_putOff.emplace_back(av_packet_clone(m_packet.get()));
+            } else {
+                Decode(m_video.get(), m_videoIndex, m_packet.get(), onVideo);
+            }
         }
         av_packet_unref(m_packet.get());
         return true;
@@ -140,6 +174,14 @@ private:
             }
         }
         return 0;
+    }
+
+    void DecodePutOff(const FrameSink& onVideo) {
+        Decode(m_video.get(), m_videoIndex, m_putOff.front().get(), onVideo);
+        m_putOff.pop_front();
+        if (m_putOff.empty() && !m_catchingUp) {
+            m_video->skip_frame = AVDISCARD_DEFAULT;
+        }
     }
 
     void Decode(AVCodecContext* codec, int index, const AVPacket* packet, const FrameSink& sink) {
@@ -182,6 +224,9 @@ private:
     double m_length = 0;
     double m_nextAudio = 0;
     bool m_draining = false;
+    bool m_catchingUp = false;
+    // Video packets read while the sound catches up with a seek, in file order.
+    std::deque<std::unique_ptr<AVPacket, PacketFreer>> m_putOff;
 };
 
 // A track of an audio CD: the conversion tool's reader, so the preview hears exactly what a rip

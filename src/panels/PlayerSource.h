@@ -30,6 +30,17 @@ public:
     // Moves to a key point at or before `seconds`; the frames that follow tell where it landed.
     virtual void Seek(double seconds) = 0;
 
+    // After a seek, until the sound has reached the target: pictures that no other picture
+    // refers to are not decoded (they would be thrown away), and a file with sound puts off
+    // decoding its pictures, so the sound of the new place is heard without waiting for a
+    // long run of pictures from the last key frame. The pictures put off are decoded next,
+    // ahead of the packets that follow them; the late ones are skipped when shown.
+    virtual void SetCatchingUp(bool /*catchingUp*/) {}
+    // Pictures put off while catching up that still wait to be decoded, and the decoding of the
+    // next of them.
+    virtual bool HasBacklog() const { return false; }
+    virtual void DecodeBacklog(const FrameSink& /*onVideo*/) {}
+
     // Reads and decodes a little (one packet); frames go to the sinks. False at the end of the
     // file (the decoders' last frames already handed out) or on a read failure.
     virtual bool Step(const FrameSink& onAudio, const FrameSink& onVideo) = 0;

@@ -226,6 +226,31 @@ TEST_F(PlayerTest, VideoPicturesFitTheBoxAndFollowTheClock) {
     }
 }
 
+TEST_F(PlayerTest, AfterASeekFarFromAKeyFrameSoundComesFirstAndPicturesCatchUp) {
+    // One key frame for eight seconds of pictures: the seek has to decode its way to 6 s.
+    const std::string path = m_dir / "longgop.mkv";
+    ASSERT_TRUE(test::RunFfmpeg(
+        "-f lavfi -i testsrc=size=320x240:rate=25:duration=8 -f lavfi -i sine=duration=8 "
+        "-c:v mpeg4 -g 300 -c:a flac '" +
+        path + "'"));
+    std::mutex mutex;
+    double lastPicture = -1;
+    player::SetPictureSink([&](const player::Picture& picture) {
+        std::lock_guard lock(mutex);
+        lastPicture = picture.pts;
+    });
+    ASSERT_EQ(avp_open(path.c_str()), 1);
+    Playback playback;
+    ASSERT_TRUE(WaitFor([] { return avp_get_cur_pos() > 0.2; }));
+    avp_set_cur_pos(6.0);
+    ASSERT_TRUE(WaitFor([] { return avp_get_cur_pos() > 6.0; }, 2000ms));
+    std::this_thread::sleep_for(700ms);
+    const double clock = avp_get_cur_pos();
+    std::lock_guard lock(mutex);
+    EXPECT_GT(lastPicture, 6.0);
+    EXPECT_NEAR(lastPicture, clock, 0.15);
+}
+
 TEST_F(PlayerTest, OddAndDamagedFilesPlayWithoutHanging) {
     // Eight channels at 192 kHz; an MP3 cut in the middle with garbage in its place.
     const std::string wide = m_dir / "wide.wav";
