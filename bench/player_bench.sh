@@ -9,6 +9,8 @@
 #       H.264 video with sound (goal under 60%, decoding included) beside ffplay showing it on
 #       this script's Xvfb; and the peak memory of a 1-minute and a 1-hour file, which the
 #       bounded queues keep alike
+#   (e) the file information page after a selection change, in the real program: built,
+#       written, read back and laid out; goal: under 50 ms
 #
 #   bench/player_bench.sh [BUILD_DIR] [ROUNDS]      (BUILD_DIR defaults to build, ROUNDS to 5)
 set -euo pipefail
@@ -22,7 +24,7 @@ if [ -z "${DISPLAY:-}" ]; then
 fi
 export SDL_AUDIODRIVER=dummy
 work=$(mktemp -d "${TMPDIR:-/tmp}/player-bench-XXXXXX")
-trap 'rm -rf "$work"' EXIT
+trap 'echo close > "$work/hook/command.txt" 2>/dev/null; sleep 1; rm -rf "$work"' EXIT
 ff() { ffmpeg -nostdin -hide_banner -loglevel error -y "$@"; }
 median() { sort -n | awk '{v[NR]=$1} END {if (NR % 2) print v[(NR+1)/2]; else print (v[NR/2]+v[NR/2+1])/2}'; }
 
@@ -85,3 +87,27 @@ read -r _ minute_mb _ < <("$bin/player_bench" play "$work/minute.wav" 3)
 read -r _ hour_mb _ < <("$bin/player_bench" play "$work/hour.wav" 3)
 printf '    peak memory: 1-minute WAV %s MB, 1-hour WAV %s MB, 720p video %s MB, MP3 %s MB\n' \
   "$minute_mb" "$hour_mb" "$ours_video_mb" "$ours_audio_mb"
+
+echo "(e) File information page after a selection change (ms, median of $rounds; goal < 50)"
+export HOME=$work/home XDG_CONFIG_HOME=$work/home/.config XDG_DATA_HOME=$work/home/.local/share
+export AUDIOCONV_TEST_DIR=$work/hook
+mkdir -p "$work/hook" "$HOME"
+state() { sed -n "s/^$1=//p" "$work/hook/state.txt" 2>/dev/null; }
+send() { # waits until the program has taken the last command
+  for _ in $(seq 100); do [ -e "$work/hook/command.txt" ] || break; sleep 0.05; done
+  printf '%s\n' "$@" > "$work/hook/command.tmp" && mv "$work/hook/command.tmp" "$work/hook/command.txt"
+}
+"$bin/audio-converter" &
+until [ -n "$(state firstpaint_ms)" ] && [ "$(state firstpaint_ms)" != 0 ]; do sleep 0.1; done
+send "add $work/minute.mp3"
+send "add $work/clip720.mp4"
+send "select 0"
+send "command 33045"
+for _ in $(seq 100); do [ "$(state fileinfo_shown)" = 1 ] && break; sleep 0.1; done
+: > "$work/info.log"
+for ((r = 0; r < rounds; r++)); do
+  send "select $(((r + 1) % 2))"
+  sleep 0.5
+  state fileinfo_ms >> "$work/info.log"
+done
+printf '    %s\n' "$(median < "$work/info.log")"

@@ -19,6 +19,7 @@ CFileInfoWnd* g_FileInfoWnd = nullptr;
 namespace {
 
 constexpr std::uint32_t kTitleText = 284;
+constexpr std::uint32_t kCloseTip = 0xC303;
 constexpr int kEdgeGrip = 3;
 constexpr int kCellWidth = 150;
 constexpr int kCellHeight = 200;
@@ -62,6 +63,7 @@ CFileInfoWnd::CFileInfoWnd(wxWindow* parent)
     m_browser = new CInfoHtml(this, kBrowserId);
     m_closeButton = new ImButton(this, kCloseId);
     m_closeButton->SetTextShown(false);
+    m_closeButton->SetToolTip(wxString::FromUTF8(Text(kCloseTip)));
     Bind(wxEVT_PAINT, &CFileInfoWnd::OnPaint, this);
     Bind(wxEVT_SIZE, &CFileInfoWnd::OnSize, this);
     Bind(wxEVT_LEFT_DOWN, &CFileInfoWnd::OnMouse, this);
@@ -133,6 +135,7 @@ void CFileInfoWnd::WritePage() {
 
 void CFileInfoWnd::OnLanguageChanged() {
     SetTitle(wxString::FromUTF8(Text(kTitleText)));
+    m_closeButton->SetToolTip(wxString::FromUTF8(Text(kCloseTip)));
     if (IsShown()) {
         WritePage();
     }

@@ -20,6 +20,9 @@ namespace {
 
 constexpr std::uint32_t kPlayText = 445;
 constexpr std::uint32_t kPauseText = 1009;
+constexpr std::uint32_t kPreviousTip = 0xC300;
+constexpr std::uint32_t kNextTip = 0xC301;
+constexpr std::uint32_t kStopTip = 0xC302;
 constexpr int kTimerPeriodMs = 300;
 constexpr int kSliderRange = 100000;
 constexpr int kVideoHeight = 182;
@@ -144,7 +147,7 @@ CPlayerWnd::CPlayerWnd(wxWindow* parent)
         event.Skip();
     });
     g_PlayerWnd = this;
-    TranslateWindow(*this, kDialogId);
+    OnLanguageChanged();
     if (!g_Skin.GetSkinDir().empty()) {
         OnSkinChanged(g_Skin.GetSkinDir());
     }
@@ -498,6 +501,9 @@ std::string CPlayerWnd::DescribeState() const {
 void CPlayerWnd::OnLanguageChanged() {
     TranslateWindow(*this, kDialogId);
     SetPlayFace(m_playFace);
+    m_previous->SetToolTip(Text(kPreviousTip));
+    m_next->SetToolTip(Text(kNextTip));
+    m_stop->SetToolTip(Text(kStopTip));
 }
 
 void CPlayerWnd::RecalcLayout() {
