@@ -178,6 +178,37 @@ std::string BuildFileInfoPage(const MediaFileInfo* info, const std::string& bgCo
     return page;
 }
 
+std::string FlattenLineBlocks(std::string_view page) {
+    static constexpr std::string_view kOpen = "<pre><font color=\"#333333\" face=\"verdana\">";
+    static constexpr std::string_view kClose = "</font></pre>";
+    std::string out;
+    out.reserve(page.size() + 256);
+    bool open = false;
+    std::size_t at = 0;
+    while (at < page.size()) {
+        const std::size_t nextOpen = page.find(kOpen, at);
+        const std::size_t nextClose = page.find(kClose, at);
+        if (nextOpen == std::string_view::npos && nextClose == std::string_view::npos) {
+            out.append(page.substr(at));
+            break;
+        }
+        if (nextClose < nextOpen) {
+            out.append(page.substr(at, nextClose + kClose.size() - at));
+            at = nextClose + kClose.size();
+            open = false;
+            continue;
+        }
+        out.append(page.substr(at, nextOpen - at));
+        if (open) {
+            out.append(kClose);
+        }
+        out.append(kOpen);
+        at = nextOpen + kOpen.size();
+        open = true;
+    }
+    return out;
+}
+
 bool WriteFileInfoPage(const std::string& path, const std::string& page) {
     std::error_code error;
     std::filesystem::create_directories(std::filesystem::path(path).parent_path(), error);

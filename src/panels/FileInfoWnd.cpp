@@ -129,7 +129,7 @@ void CFileInfoWnd::WritePage() {
         shown = m_page;
     }
     // The page is ASCII: its bytes are its characters.
-    m_browser->SetPage(wxString::FromAscii(shown.c_str()));
+    m_browser->SetPage(wxString::FromAscii(FlattenLineBlocks(shown).c_str()));
     m_lastShowMs = (wxGetUTCTimeUSec() - begin).ToDouble() / 1000.0;
 }
 

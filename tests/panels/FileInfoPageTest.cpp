@@ -146,6 +146,29 @@ TEST_F(FileInfoPageTest, TextsFromTheFileAreEscapedAndThePageStaysAscii) {
     EXPECT_NE(german.find("<strong>&#220;bersicht &amp; mehr:\n</strong>"), std::string::npos);
 }
 
+TEST_F(FileInfoPageTest, NestedLineBlocksAreLaidOutOneAfterAnother) {
+    MediaFileInfo info;
+    info.path = "/a/b.mp3";
+    info.title = "T";
+    info.audioStreams.push_back({"mp3", 2, 128000, 44100});
+    const std::string page = BuildFileInfoPage(&info, "#FFF", English);
+    const std::string flat = FlattenLineBlocks(page);
+    auto count = [](const std::string& text, const std::string& what) {
+        std::size_t n = 0;
+        for (auto at = text.find(what); at != std::string::npos; at = text.find(what, at + 1)) {
+            ++n;
+        }
+        return n;
+    };
+    // Every line block is closed in the flat page; the tag lines after the first gained one.
+    EXPECT_EQ(count(flat, kLine), count(flat, "</font></pre>"));
+    EXPECT_EQ(count(flat, "</font></pre>"), count(page, "</font></pre>") + 9);
+    EXPECT_NE(flat.find(kLine + "  Title:\t\tT\n</font></pre>" + kLine + "  Aritist:"),
+              std::string::npos);
+    EXPECT_EQ(FlattenLineBlocks(flat), flat);
+    EXPECT_EQ(FlattenLineBlocks("<body bgcolor='#FFF'></body>"), "<body bgcolor='#FFF'></body>");
+}
+
 TEST_F(FileInfoPageTest, PageIsReplacedWholeAndItsFolderMade) {
     const std::string path = m_dir / "help/tempfile.htm";
     ASSERT_TRUE(WriteFileInfoPage(path, "<body bgcolor='#F3F6FA'></body>"));
