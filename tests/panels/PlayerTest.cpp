@@ -15,6 +15,7 @@
 #include <chrono>
 #include <cmath>
 #include <fcntl.h>
+#include <filesystem>
 #include <mutex>
 #include <thread>
 #include <unistd.h>
@@ -273,6 +274,21 @@ TEST_F(PlayerTest, OddAndDamagedFilesPlayWithoutHanging) {
         Playback playback;
         EXPECT_TRUE(WaitFor([&] { return playback.Done(); }, 6000ms));
     }
+}
+
+TEST_F(PlayerTest, FileDeletedWhilePlayingPlaysOnUntouched) {
+    const std::string path = MakeCountingWav("gone.wav", 1.5);
+    const std::string before = test::ReadFile(path);
+    ASSERT_EQ(avp_open(path.c_str()), 1);
+    Playback playback;
+    ASSERT_TRUE(WaitFor([] { return avp_get_cur_pos() > 0.1; }));
+    const std::string copy = m_dir / "kept.wav";
+    std::filesystem::copy_file(path, copy);
+    std::filesystem::remove(path);
+    EXPECT_TRUE(WaitFor([&] { return playback.Done(); }, 4000ms));
+    EXPECT_NEAR(avp_get_cur_pos(), 1.5, 0.05);
+    // The player only ever reads.
+    EXPECT_EQ(test::ReadFile(copy), before);
 }
 
 TEST_F(PlayerTest, TenHourFileSeeksToItsEnd) {
