@@ -1,3 +1,4 @@
+#include "shell/Preferences.h"
 #include "shell/AudioEncDlg.h"
 
 #include "cddb/ui/CddbWaitDlg.h"
@@ -40,6 +41,7 @@
 #include <wx/utils.h>
 
 #include <algorithm>
+#include <sys/stat.h>
 #include <sstream>
 
 namespace ac {
@@ -51,6 +53,7 @@ namespace {
 // Free space below which a burn stops: 200 MB.
 constexpr long long kLowDiskBytes = 209715200LL;
 constexpr int kPlayerHeight = 280;
+constexpr std::uint32_t kFilesRefusedDuringRunId = 0xC185;
 
 // afterconvert keeps 0 shut down, 1 standby, 2 hibernate, 3 exit, 4 none; the menu lists
 // No action, Shut Down, Hibernate, Standby, Kill me.
@@ -526,6 +529,11 @@ void CAudioEncDlg::OnCommand(wxCommandEvent& event) {
             LoadModeMenu(GetWorkMode());
             return;
         }
+        case cmd::kPreferences: {
+            CPreferencesSheet sheet(this, [this] { OnPreferencesApplied(); });
+            sheet.ShowModal();
+            return;
+        }
         case cmd::kContents:
             OpenHelpPage(GetAppConfig().GetBaseDirectory() + "/help/Default.htm", this);
             return;
@@ -540,6 +548,53 @@ void CAudioEncDlg::OnCommand(wxCommandEvent& event) {
             // Commands of the list panels arrive here once those panels exist.
             event.Skip();
             return;
+    }
+}
+
+void CAudioEncDlg::OnPreferencesApplied() {
+    m_afterConvert = GetAppConfig().GetInt("afterconvert");
+    if (m_convert) {
+        m_convert->SetAfterConvertAction(m_afterConvert);
+        m_convert->ReloadSettings();
+    }
+    if (m_rip) {
+        m_rip->SetAfterRunAction(m_afterConvert);
+    }
+    if (g_RipDlg != nullptr) {
+        g_RipDlg->ReadSettings();
+    }
+}
+
+void CAudioEncDlg::OpenFiles(const std::vector<std::string>& paths) {
+    if (IsIconized()) {
+        Iconize(false);
+    }
+    Show();
+    Raise();
+    if (paths.empty() || g_MediaList == nullptr) {
+        return;
+    }
+    // Rows take the selected profile, which the side bar loads after the window shows.
+    if (g_SideBar == nullptr || !g_SideBar->IsLoaded()) {
+        m_pendingOpen.insert(m_pendingOpen.end(), paths.begin(), paths.end());
+        return;
+    }
+    if (IsConvertRunActive()) {
+        // Rows added under a running driver would change the run the user started.
+        SetStatusText(g_Language.GetString(kFilesRefusedDuringRunId));
+        return;
+    }
+    if (GetWorkMode() != 0) {
+        SwitchMode(0);
+    }
+    for (const std::string& path : paths) {
+        struct stat info;
+        // A folder opens as the Add Folder button opens one: its media files, one level deep.
+        if (::stat(path.c_str(), &info) == 0 && S_ISDIR(info.st_mode)) {
+            g_MediaList->AddFolder(path, -1);
+        } else {
+            g_MediaList->AddFile(path, -1);
+        }
     }
 }
 

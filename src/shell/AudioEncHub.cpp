@@ -18,6 +18,7 @@
 #include <wx/menu.h>
 
 #include <strings.h>
+#include <utility>
 
 namespace ac {
 
@@ -248,6 +249,9 @@ void CAudioEncDlg::OnCatalogueLoaded() {
     }
     // The side bar may now want more room for its longest profile name.
     RecalcLayout();
+    if (!m_pendingOpen.empty()) {
+        OpenFiles(std::exchange(m_pendingOpen, {}));
+    }
 }
 
 std::vector<ParameterSet*> CAudioEncDlg::SelectedSets() {

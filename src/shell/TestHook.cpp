@@ -1,3 +1,4 @@
+#include "shell/Preferences.h"
 #include "shell/TestHook.h"
 
 #include "cddb/ui/CddbSelectDlg.h"
@@ -142,6 +143,9 @@ std::string CTestHook::DescribeState(const CAudioEncDlg& dlg) {
     out << "corners=" << (dlg.HasFlag(wxFRAME_SHAPED) ? 1 : 0) << "\n";
     out << "maximized=" << (dlg.IsMaximized() ? 1 : 0) << "\n";
     DescribePanels(dlg, out);
+    if (const CPreferencesSheet* sheet = CPreferencesSheet::Shown()) {
+        out << sheet->Describe();
+    }
     out << "firstpaint_ms=" << dlg.m_firstPaintMs << "\n";
     out << "resize_ms=" << dlg.m_lastBench << "\n";
     return out.str();
@@ -303,6 +307,19 @@ void CTestHook::RunScriptCommand(CAudioEncDlg& dlg, const std::string& line) {
             }
             break;
         }
+    } else if (verb == "prefset" && CPreferencesSheet::Shown() != nullptr) {
+        // prefset PAGE ID VALUE: a control of a preferences page set as a user would.
+        std::size_t page = 0;
+        int id = 0;
+        in >> page >> id;
+        std::string value;
+        std::getline(in >> std::ws, value);
+        const auto pages = CPreferencesSheet::Shown()->Pages();
+        if (page < pages.size()) {
+            pages[page]->SetControl(id, value);
+        }
+    } else if (verb == "prefapply" && CPreferencesSheet::Shown() != nullptr) {
+        CPreferencesSheet::Shown()->ApplyAll();
     } else if (verb == "saveas" && g_SideBar != nullptr) {
         g_SideBar->SaveProfile(true);
     } else if (verb == "rename" && g_SideBar != nullptr) {

@@ -203,6 +203,16 @@ TEST_F(AcripTest, CddbLooksTheDiscUpTakesTheChosenMatchAndNamesItOfflineLater) {
         ASSERT_EQ(server.Requests().size(), 2u);
         EXPECT_TRUE(Contains(server.Requests()[1], "cmd=cddb+read+misc+14001403&hello="));
 
+        // An entry the server sends without the comments every xmcd entry carries is no
+        // record: exit 1 and the reason, not only "did not name".
+        test::CddbTestServer broken;
+        broken.AddRecord("rock", 0x14001403, "Band / Album",
+                         "DISCID=14001403\r\nDTITLE=Band / Album\r\nTTITLE0=One\r\n");
+        const test::ToolResult bare = Acrip({"--device", gapped.cuePath, "--cddb", "--server",
+                                             "127.0.0.1:" + std::to_string(broken.Port())});
+        EXPECT_EQ(bare.exitCode, 1);
+        EXPECT_TRUE(Contains(bare.err, "acrip: The disc entry")) << bare.err;
+
         // A match number past the list takes the first, and says so.
         const test::ToolResult past =
             Acrip({"--device", gapped.cuePath, "--cddb", "--server",

@@ -463,6 +463,8 @@ void CDRipDlg::RefreshDriverSettings() {
     RipSettings settings;
     settings.outputDirectory = config.GetString("OutputCDDir");
     settings.ejectCd = config.GetInt("ejectcd") != 0;
+    settings.slowdown = config.GetInt("slowdown") != 0;
+    settings.idle = config.GetInt("idle") != 0;
     settings.naming = ReadNamingSettings(config);
     settings.toolPath = platform::FindConversionTool();
     settings.toolDirectory = wxFileName(wxString::FromUTF8(settings.toolPath)).GetPath().utf8_string();
