@@ -5,6 +5,8 @@
 
 #include "medialist/ui/MediaListWnd.h"
 #include "medialist/ui/OutputPanelWnd.h"
+#include "panels/FileInfoWnd.h"
+#include "panels/PlayerWnd.h"
 #include "panels/ProgramDialogs.h"
 #include "panels/StatusWnd.h"
 #include "platform/DiscDevice.h"
@@ -18,6 +20,7 @@
 #include "shell/ConvertMode.h"
 #include "shell/MenuTables.h"
 #include "shell/MessageBoxes.h"
+#include "shell/PlayerLists.h"
 #include "shell/ProgramIcon.h"
 #include "shell/RipMode.h"
 #include "convert/RowParameters.h"
@@ -165,7 +168,10 @@ void CAudioEncDlg::CreatePanels() {
     m_panels[SideBar] = new CSideBarWnd(this);
     m_panels[MediaList] = new CMediaListWnd(this);
     m_panels[Output] = new COutputPanelWnd(this);
-    m_panels[Player] = new ImSkinPanel(this, 1008, "PlayerPanel");
+    auto* player = new CPlayerWnd(this);
+    player->SetModeList(0, &ConvertPreviewList());
+    player->SetModeList(1, &RipPreviewList());
+    m_panels[Player] = player;
     m_panels[Rip] = new CDRipDlg(this, platform::MakeDiscDevice());
     // The context menu of the list still to come; the media and rip lists open their own.
     const std::pair<Panel, int> contextMenus[] = {{Creator, kBurnListContextMenu}};
@@ -177,6 +183,7 @@ void CAudioEncDlg::CreatePanels() {
         });
     }
     m_panels[Player]->SetSize(-1, kPlayerHeight);
+    new CFileInfoWnd(this);  // hidden until Show File Information; goes with this window
 }
 
 int CAudioEncDlg::GetWorkMode() const {
@@ -285,6 +292,10 @@ void CAudioEncDlg::OnInitMenuPopup(wxMenu* menu) {
         }
     }
     ApplyEnableRules(*menu);
+    if (wxMenuItem* info = menu->FindChildItem(CFileInfoWnd::kCommandId);
+        info != nullptr && info->IsCheckable() && g_FileInfoWnd != nullptr) {
+        info->Check(g_FileInfoWnd->IsShown());
+    }
     for (int id = cmd::kAfterFirst; id <= cmd::kAfterLast; ++id) {
         if (wxMenuItem* item = menu->FindChildItem(id)) {
             item->Check(kAfterConvertOfCommand[id - cmd::kAfterFirst] == m_afterConvert);
@@ -302,6 +313,9 @@ void CAudioEncDlg::OnLanguageChanged() {
 void CAudioEncDlg::OnLanguageCommand() {
     LoadModeMenu(GetWorkMode());
     OnLanguageChanged();
+    if (g_FileInfoWnd != nullptr) {
+        g_FileInfoWnd->OnLanguageChanged();
+    }
     // Skins may carry language variants of their pictures and keys.
     g_Skin.SetSkin(g_Skin.GetSkinName());
     Refresh();
@@ -475,6 +489,13 @@ void CAudioEncDlg::OnCommand(wxCommandEvent& event) {
         }
         return;
     }
+    // Show File Information serves every mode: the window shows whatever row it was given.
+    if (id == CFileInfoWnd::kCommandId && g_FileInfoWnd != nullptr) {
+        if (IsCommandEnabled(id)) {
+            g_FileInfoWnd->ShowInfo(true);
+        }
+        return;
+    }
     if (m_rip && GetWorkMode() == 1 && m_rip->IsOwnCommand(id)) {
         m_rip->OnCommand(id);
         return;
@@ -484,6 +505,9 @@ void CAudioEncDlg::OnCommand(wxCommandEvent& event) {
         if (GetWorkMode() == 0) {
             m_convert->OnCommand(id);
         }
+        return;
+    }
+    if (g_PlayerWnd != nullptr && g_PlayerWnd->OnCommand(id)) {
         return;
     }
     switch (id) {

@@ -3,6 +3,7 @@
 
 #include "convert/RowParameters.h"
 #include "medialist/ui/MediaListWnd.h"
+#include "panels/FileInfoWnd.h"
 #include "panels/StatusWnd.h"
 #include "profile/ParameterSet.h"
 #include "profile/ui/SideBarWnd.h"
@@ -60,6 +61,14 @@ void CAudioEncDlg::ShowContextMenu(wxWindow* owner, int menuId) {
 
 void CAudioEncDlg::OnListSelectionChanged(int row) {
     const int mode = GetWorkMode();
+    if (mode == 0 && g_MediaList != nullptr) {
+        // The file information follows the selection: the row that became selected, or with
+        // none left the empty page.
+        const int shown = row >= 0 ? row : g_MediaList->GetFirstSelected();
+        ShowFileInfo(shown >= 0 ? g_MediaList->GetItem(shown) : nullptr);
+    } else if (mode == 1) {
+        ShowFileInfo(nullptr);  // tracks of a disc carry no probed details
+    }
     if (mode != 0 || g_MediaList == nullptr) {
         return;
     }
@@ -162,8 +171,10 @@ void CAudioEncDlg::SetBitRateAllowed(bool allowed) {
     }
 }
 
-void CAudioEncDlg::ShowFileInfo(MediaItem* /*item*/) {
-    // The file information window is not part of this build yet.
+void CAudioEncDlg::ShowFileInfo(MediaItem* item) {
+    if (g_FileInfoWnd != nullptr) {
+        g_FileInfoWnd->SetItem(item != nullptr ? &item->info : nullptr);
+    }
 }
 
 bool CAudioEncDlg::IsBitRateFree(const std::string& extension) {

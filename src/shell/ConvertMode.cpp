@@ -181,7 +181,7 @@ bool CConvertMode::OnCommand(int commandId) {
         case id::kSelectAll: list.SelectAll(true); break;
         case id::kSelectNone: list.SelectAll(false); break;
         case id::kConfigureToAll: list.ConfigureToAll(); break;
-        case id::kShowFileInfo: break;  // the file information window comes with its panel
+        case id::kShowFileInfo: break;  // the main dialog shows the file information window
         default: return false;
     }
     m_driver->UpdateCheckingEnabled();

@@ -10,6 +10,8 @@
 #include "convert/RowParameters.h"
 #include "medialist/ui/MediaListWnd.h"
 #include "medialist/ui/OutputPanelWnd.h"
+#include "panels/FileInfoWnd.h"
+#include "panels/PlayerWnd.h"
 #include "panels/StatusWnd.h"
 #include "profile/ParameterSet.h"
 #include "profile/ui/ParameterGrid.h"
@@ -210,6 +212,14 @@ void CTestHook::DescribePanels(const CAudioEncDlg& dlg, std::ostream& out) {
     if (g_StatusWnd != nullptr) {
         out << g_StatusWnd->DescribeState() << "\n";
     }
+    if (g_PlayerWnd != nullptr) {
+        out << g_PlayerWnd->DescribeState();
+    }
+    if (g_FileInfoWnd != nullptr) {
+        out << "fileinfo_shown=" << (g_FileInfoWnd->IsShown() ? 1 : 0) << "\n";
+        out << "fileinfo_bytes=" << g_FileInfoWnd->PageText().size() << "\n";
+        out << "fileinfo_ms=" << g_FileInfoWnd->LastShowMs() << "\n";
+    }
     std::string boxes;
     for (std::string text : ShownBoxes()) {
         std::replace(text.begin(), text.end(), '\n', ' ');
@@ -355,6 +365,11 @@ void CTestHook::RunScriptCommand(CAudioEncDlg& dlg, const std::string& line) {
     } else if (verb == "command") {
         int id = 0;
         in >> id;
+        // 1012 is also the conversion list's Stop button: it goes to the player while that plays.
+        if (g_PlayerWnd != nullptr && (id != CPlayerWnd::kStopId || g_PlayerWnd->IsPlaying()) &&
+            g_PlayerWnd->OnCommand(id)) {
+            return;
+        }
         wxCommandEvent command(wxEVT_MENU, id);
         dlg.OnCommand(command);
     } else if (verb == "skin") {
