@@ -50,11 +50,4 @@ inline int CountOpenFds() {
 
 }  // namespace ac::test
 
-namespace ac::test {
-
-inline std::string ReadFile(const std::string& path) {
-    std::ifstream in(path);
-    return std::string((std::istreambuf_iterator<char>(in)), {});
-}
-
-}  // namespace ac::test
+#include "../support/Files.h"

@@ -185,9 +185,23 @@ TEST_F(RipWindowTest, CdTextNamesADiscWithoutARecord) {
     ac::test::WriteSettings(home, "last_run_function=dword:1\ncdimages=sz:" + texts.cuePath +
                                       "\nlocalcddb=sz:" + (home / "cddb") + "\n");
     Program program(home);
-    const State state = program.WaitFor([](const State& s) { return RowField(s, 2, 0) == "Song 3"; });
+    State state = program.WaitFor([](const State& s) { return RowField(s, 2, 0) == "Song 3"; });
     EXPECT_EQ(RowField(state, 0, 0), "Song 1");
     EXPECT_EQ(Field(state, "ripboxes").rfind("Harbour Band|Lights at Night|", 0), 0u) << Field(state, "ripboxes");
+
+    // Rip > Read From Local CDDB: a disc without a record says so; one with a record is named
+    // from it.
+    program.Send("command 33088");
+    state = program.WaitFor([](const State& s) { return Field(s, "boxes").find("no local CDDB record") != std::string::npos; });
+    EXPECT_NE(Field(state, "boxes").find("no local CDDB record of disc " + Field(state, "ripdiscid")), std::string::npos)
+        << Field(state, "boxes");
+    std::ofstream(home / ("cddb/" + Field(state, "ripdiscid") + ".cddb"))
+        << "[CDINFO]\r\nARITIST=Local Artist\r\nALBUM=Local Album\r\n[MUSIC]\r\nTotal=3\r\n"
+        << "Track00=Local One\r\nTrack01=Local Two\r\nTrack02=Local Three\r\n";
+    program.Send("command 33088");
+    state = program.WaitFor([](const State& s) { return RowField(s, 0, 0) == "Local One"; });
+    EXPECT_EQ(RowField(state, 0, 0), "Local One");
+    EXPECT_EQ(Field(state, "ripboxes").rfind("Local Artist|Local Album|", 0), 0u) << Field(state, "ripboxes");
 }
 
 }  // namespace

@@ -13,6 +13,8 @@
 #include <string>
 #include <vector>
 
+#include "Files.h"
+
 namespace ac::test {
 
 // Interleaved 16-bit samples; frames() counts sample frames.
@@ -63,15 +65,6 @@ inline std::string WavBytes(const Pcm& pcm, std::uint32_t claimedDataBytes = 0) 
     return out;
 }
 
-inline void WriteFile(const std::string& path, const std::string& bytes) {
-    std::ofstream out(path, std::ios::binary);
-    out.write(bytes.data(), static_cast<std::streamsize>(bytes.size()));
-}
-
-inline std::string ReadFile(const std::string& path) {
-    std::ifstream in(path, std::ios::binary);
-    return std::string(std::istreambuf_iterator<char>(in), std::istreambuf_iterator<char>());
-}
 
 inline void WriteWav(const std::string& path, const Pcm& pcm) { WriteFile(path, WavBytes(pcm)); }
 

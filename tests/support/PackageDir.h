@@ -16,18 +16,10 @@
 
 #include "TempDir.h"
 
+#include "Files.h"
+
 namespace ac::test {
 
-inline std::string ReadFile(const std::string& path) {
-    std::ostringstream out;
-    out << std::ifstream(path, std::ios::binary).rdbuf();
-    return out.str();
-}
-
-inline void WriteFile(const std::string& path, const std::string& bytes) {
-    std::filesystem::create_directories(std::filesystem::path(path).parent_path());
-    std::ofstream(path, std::ios::binary) << bytes;
-}
 
 class PackageDir : public ::testing::Test {
 protected:

@@ -177,6 +177,19 @@ void CDRipDlg::FillList(int driveIndex, const platform::DiscTable& table) {
     UpdateButtons();
 }
 
+// Names the disc again from its local record, undoing edits the user has not saved there.
+void CDRipDlg::ReadLocalRecord() {
+    cddb::CDDiscInfo record;
+    if (!cddb::LoadDiscFile(m_cddbFolder, m_discId, record)) {
+        if (m_modeHost) {
+            m_modeHost->ShowError(
+                FormatText(g_Language.GetString(riptext::kNoLocalRecord), {cddb::FormatDiscId(m_discId)}));
+        }
+        return;
+    }
+    ApplyRecord(record);
+}
+
 void CDRipDlg::ApplyRecord(const cddb::CDDiscInfo& record) {
     m_record = record;
     m_record.Fit();
@@ -391,8 +404,8 @@ bool CDRipDlg::IsCommandEnabled(int commandId) {
         case ripcmd::kCddb: return rows && !m_running && !m_lookupOpen;
         // The batch needs no disc: its records are in the file.
         case ripcmd::kBatchQuery: return !m_running && !m_lookupOpen;
-        case ripcmd::kReadLocal:
-        case ripcmd::kReadRemote:
+        case ripcmd::kReadLocal: return rows && !m_running;
+        case ripcmd::kReadRemote: return rows && !m_running && !m_lookupOpen;
         case ripcmd::kReadWinamp: return rows && !m_running;
         case ripcmd::kRipChecked: return rows && (!m_running || m_paused);
         case ripcmd::kPauseChecked: return rows && m_running && !m_paused;
@@ -445,9 +458,9 @@ bool CDRipDlg::OnCommand(int commandId) {
         case ripcmd::kAddDiscImage: AddDiscImage(); return true;
         case ripcmd::kCddb: LookupThread(); return true;
         case ripcmd::kBatchQuery: OnBatchQuery(); return true;
-        case ripcmd::kReadLocal:
-        case ripcmd::kReadRemote:
-        case ripcmd::kReadWinamp: return true;  // kept in the menus; no source behind them
+        case ripcmd::kReadLocal: ReadLocalRecord(); return true;
+        case ripcmd::kReadRemote: LookupThread(); return true;
+        case ripcmd::kReadWinamp: return true;  // kept in the menu; there is no Winamp here
         default: break;
     }
     if (commandId >= ripcmd::kFirstMenuDrive && commandId <= ripcmd::kLastMenuDrive) {

@@ -154,6 +154,7 @@ public:
     // dialog over the lookup worker, then the names into the list and the .cddb record. It runs
     // on the UI thread, as every wx dialog must; the network work is the dialog's worker's.
     void LookupThread();
+    void ReadLocalRecord();
     // "CDDB Batch Query": every record of CDDB_Batch.txt asked again, each answer stored.
     void OnBatchQuery();
     bool IsLookupOpen() const { return m_lookupOpen; }

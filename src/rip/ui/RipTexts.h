@@ -22,5 +22,6 @@ inline constexpr std::uint32_t kNoDiscImage = 0xC1A6;
 inline constexpr std::uint32_t kTrack = 0xC1A7;
 inline constexpr std::uint32_t kNoDrive = 0xC1A8;
 inline constexpr std::uint32_t kRipSummary = 0xC1A9;
+inline constexpr std::uint32_t kNoLocalRecord = 0xC1AA;
 
 }  // namespace ac::riptext
