@@ -1,5 +1,6 @@
 #include "shell/AudioEncDlg.h"
 
+#include "burn/ui/CDCreatorPanel.h"
 #include "cddb/ui/CddbWaitDlg.h"
 
 #include "medialist/ui/MediaListWnd.h"
@@ -13,6 +14,7 @@
 #include "profile/ui/SideBarWnd.h"
 #include "resources/Language.h"
 #include "shell/AppConfig.h"
+#include "shell/BurnMode.h"
 #include "shell/Check.h"
 #include "shell/ConvertMode.h"
 #include "shell/MenuTables.h"
@@ -104,6 +106,9 @@ CAudioEncDlg::~CAudioEncDlg() {
     if (g_RipDlg != nullptr) {
         g_RipDlg->SetModeHost(nullptr);
     }
+    if (g_CreatorPanel != nullptr) {
+        g_CreatorPanel->SetModeHost(nullptr);
+    }
     if (GetMainHub() == this) {
         SetMainHub(nullptr);
     }
@@ -142,6 +147,7 @@ void CAudioEncDlg::OnInitDialog() {
         mode = 0;
     }
     m_rip = std::make_unique<CRipMode>(this, *g_RipDlg);
+    m_burn = std::make_unique<CBurnMode>(this, *g_CreatorPanel);
     LoadModeMenu(mode);
     m_convert = std::make_unique<CConvertMode>(this);
     m_convert->SetWorkMode(mode);
@@ -158,21 +164,12 @@ void CAudioEncDlg::CreatePanels() {
     // Order of creation is the order of skin notices.
     m_check = new CCheck(this);
     m_panels[Status] = new CStatusWnd(this);
-    m_panels[Creator] = new ImSkinPanel(this, 1001, "CDCreatorPanel");
+    m_panels[Creator] = new CCDCreatorPanel(this);
     m_panels[SideBar] = new CSideBarWnd(this);
     m_panels[MediaList] = new CMediaListWnd(this);
     m_panels[Output] = new COutputPanelWnd(this);
     m_panels[Player] = new ImSkinPanel(this, 1008, "PlayerPanel");
     m_panels[Rip] = new CDRipDlg(this, platform::MakeDiscDevice());
-    // The context menu of the list still to come; the media and rip lists open their own.
-    const std::pair<Panel, int> contextMenus[] = {{Creator, kBurnListContextMenu}};
-    for (const auto& [panel, menuId] : contextMenus) {
-        m_panels[panel]->Bind(wxEVT_CONTEXT_MENU, [this, menuId = menuId](wxContextMenuEvent&) {
-            std::unique_ptr<wxMenu> menu = BuildContextMenu(menuId);
-            TranslatePopupMenu(*menu, menuId);
-            PopupMenu(menu.get());
-        });
-    }
     m_panels[Player]->SetSize(-1, kPlayerHeight);
 }
 
@@ -413,7 +410,7 @@ void CAudioEncDlg::FromTray() {
 bool CAudioEncDlg::RunStopLogic() {
     // A rip keeps running in the background of another tab, so its question comes in any mode.
     m_bCloseAccepted = (GetWorkMode() != 0 || !m_convert || m_convert->StopForClose()) &&
-                       (!m_rip || m_rip->StopForClose());
+                       (!m_rip || m_rip->StopForClose()) && (!m_burn || m_burn->StopForClose());
     return m_bCloseAccepted;
 }
 
@@ -470,10 +467,17 @@ void CAudioEncDlg::OnCommand(wxCommandEvent& event) {
         if (m_rip) {
             m_rip->SetAfterRunAction(m_afterConvert);
         }
+        if (m_burn) {
+            m_burn->SetAfterRunAction(m_afterConvert);
+        }
         return;
     }
     if (m_rip && GetWorkMode() == 1 && m_rip->IsOwnCommand(id)) {
         m_rip->OnCommand(id);
+        return;
+    }
+    if (m_burn && GetWorkMode() == 2 && m_burn->IsOwnCommand(id)) {
+        m_burn->OnCommand(id);
         return;
     }
     // Commands of another mode do nothing when they arrive anyway.
