@@ -242,6 +242,9 @@ void BurnDriver::RunBurn() {
     }
 
     // Stage one: every row to a temporary file.
+    const auto conversionStart = std::chrono::steady_clock::now();
+    m_conversionSeconds = 0;
+    m_writeSeconds = 0;
     m_converting = 1;
     m_rowCursor = -1;
     m_secondsDone = 0;
@@ -291,6 +294,7 @@ void BurnDriver::RunBurn() {
     }
     for (std::thread& thread : threads)
         thread.join();
+    m_conversionSeconds = std::chrono::duration<double>(std::chrono::steady_clock::now() - conversionStart).count();
     ProgressTick();
     {
         std::lock_guard lock(m_slotLock);
@@ -504,7 +508,10 @@ bool BurnDriver::BurnOneCopy() {
             return false;
         job.tree = &m_tree;
     }
-    return m_recorder->Burn(job, *this);
+    const auto start = std::chrono::steady_clock::now();
+    const bool written = m_recorder->Burn(job, *this);
+    m_writeSeconds = m_writeSeconds + std::chrono::duration<double>(std::chrono::steady_clock::now() - start).count();
+    return written;
 }
 
 void BurnDriver::Eject(bool showText) {

@@ -153,6 +153,10 @@ public:
     bool Aborted() const { return m_abort.load() != 0; }
     int CopiesDone() const { return m_copiesDone.load(); }
     double BarPosition() const;
+    // Wall seconds of the last run's conversion stage and of its copies' writes, for the
+    // benchmarks and acburn --times.
+    double ConversionSeconds() const { return m_conversionSeconds.load(); }
+    double WriteSeconds() const { return m_writeSeconds.load(); }
     // The temporary files of this run still on disk (nothing once the run has ended).
     std::vector<std::string> TemporaryFiles() const;
 
@@ -196,6 +200,8 @@ private:
     std::atomic<int> m_closing{0};
     std::atomic<int> m_copiesDone{0};
     std::atomic<int> m_diskFull{0};
+    std::atomic<double> m_conversionSeconds{0};
+    std::atomic<double> m_writeSeconds{0};
 
     std::mutex m_writeLock;  // writing and abort against StopBurn
     std::mutex m_cursorLock;

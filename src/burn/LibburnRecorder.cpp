@@ -2,6 +2,7 @@
 #include "burn/LibburnRecorder.h"
 
 #include "burn/ImageRecorder.h"
+#include "burn/ScriptedRecorder.h"
 #include "burn/IsoSession.h"
 #include "burn/WavFile.h"
 
@@ -177,6 +178,8 @@ std::vector<std::unique_ptr<ICdRecorder>> RetryRecorder(const std::string& image
             lb::burn_drive_info_free(drives);
         }
     }
+    if (const char* fake = std::getenv("AC_FAKE_RECORDER"); fake && *fake)
+        recorders.push_back(std::make_unique<ScriptedRecorder>(fake));
     recorders.push_back(std::make_unique<ImageRecorder>(imageBase));
     return recorders;
 }

@@ -200,6 +200,12 @@ void CTestHook::DescribePanels(const CAudioEncDlg& dlg, std::ostream& out) {
         out << "burntally=" << g_CreatorPanel->Tally().minutes << ":" << g_CreatorPanel->Tally().seconds << "\n";
         out << "burnactive=" << (g_CreatorPanel->Driver().BurnActive() ? 1 : 0) << "\n";
         out << "burnrecorders=" << g_CreatorPanel->Recorders().size() << "\n";
+        // Add, Remove, Clear, Burn, Stop, Move up, Move down: 1 where the command is enabled.
+        out << "burnenabled=";
+        for (int id : {burncmd::kAdd, burncmd::kRemove, burncmd::kClear, burncmd::kBurn, burncmd::kStop,
+                       burncmd::kMoveUp, burncmd::kMoveDown})
+            out << (g_CreatorPanel->IsCommandEnabled(id) ? 1 : 0);
+        out << "\n";
         if (CFileAddErrorWnd* refused = g_CreatorPanel->RefusedWindow()) {
             std::string text = refused->RichEdit()->GetValue().utf8_string();
             std::replace(text.begin(), text.end(), '\n', '|');
@@ -208,7 +214,9 @@ void CTestHook::DescribePanels(const CAudioEncDlg& dlg, std::ostream& out) {
         }
     }
     if (CWaitingDiscDlg* waiting = CWaitingDiscDlg::Shown()) {
-        out << "waitingdisc=" << waiting->Describe() << "\n";
+        std::string text = waiting->Describe();
+        std::replace(text.begin(), text.end(), '\n', ' ');
+        out << "waitingdisc=" << text << "\n";
     }
     if (CEraseRewritableDiscDlg* erase = CEraseRewritableDiscDlg::Shown()) {
         out << "erasedisc=" << erase->Describe() << "\n";

@@ -15,7 +15,10 @@
 
 #include <cstdlib>
 #include <filesystem>
+#include <fstream>
+#include <iterator>
 #include <sstream>
+#include <thread>
 
 namespace {
 
@@ -182,6 +185,137 @@ TEST_F(BurnWindowTest, MpThreeDiscIsAnIsoWithTheConvertedFiles) {
     iso_image_unref(image);
     iso_read_opts_free(options);
     iso_data_source_unref(source);
+}
+
+}  // namespace
+
+namespace {
+
+std::string ReadText(const std::string& path) {
+    std::ifstream in(path);
+    return std::string((std::istreambuf_iterator<char>(in)), {});
+}
+
+TEST_F(BurnWindowTest, ListRulesMovesRemovalAndRefusedNames) {
+    WriteSettings(1);
+    Program program(home);
+    State state = program.WaitFor(
+        [](const State& s) { return Field(s, "profile").find("WAV") != std::string::npos; });
+    // An empty list: only Add.
+    EXPECT_EQ(Field(state, "burnenabled"), "1000000");
+    state = AddTracks(program);
+    // A name of 104 characters is taken, one of 105 refused.
+    const std::string longer = home / ("tracks/" + std::string(105, 'n') + ".wav");
+    const std::string fits = home / ("tracks/" + std::string(104, 'm') + ".wav");
+    fs::copy_file(tracks[0], longer);
+    fs::copy_file(tracks[0], fits);
+    program.Send("burnadd " + longer);
+    program.Send("burnadd " + fits);
+    state = program.WaitFor([](const State& s) {
+        return s.count("burnrow3") > 0 && Field(s, "refused").find("too long") != std::string::npos;
+    });
+    EXPECT_EQ(state.count("burnrow4"), 0u);
+    EXPECT_EQ(RowField(state, 3, 1), std::string(104, 'm'));
+
+    // Rows 0 and 2 selected: the button is off (row 0 cannot go up), yet Move up from the menu
+    // moves only row 2, and the numbers run on.
+    program.Send("burnselect 0 2");
+    state = program.WaitFor([](const State& s) { return RowField(s, 2, 5) == "1"; });
+    EXPECT_EQ(Field(state, "burnenabled"), "1111001");
+    program.Send("command 1187");
+    state = program.WaitFor([](const State& s) { return RowField(s, 1, 1) == "song3"; });
+    EXPECT_EQ(RowField(state, 0, 1), "song1");
+    EXPECT_EQ(RowField(state, 2, 1), "song2");
+    EXPECT_EQ(RowField(state, 2, 0), "03");
+    EXPECT_EQ(Field(state, "burnenabled"), "1111001") << "row 0 is selected: no Move up";
+
+    // Removing the track of 2 seconds takes it and its gap off the tally (2, 1, 0 and 2 seconds
+    // and four gaps before).
+    const std::string before = Field(state, "burntally");
+    program.Send("burnselect 0");
+    program.Send("command 32772");
+    state = program.WaitFor(
+        [](const State& s) { return s.count("burnrow3") == 0 && RowField(s, 0, 1) == "song3"; });
+    EXPECT_EQ(before, "0:13");
+    EXPECT_EQ(Field(state, "burntally"), "0:9");
+    EXPECT_EQ(RowField(state, 0, 0), "01");
+    program.Send("command 32773");
+    state = program.WaitFor([](const State& s) { return s.count("burnrow0") == 0; });
+    EXPECT_EQ(Field(state, "burntally"), "0:0");
+}
+
+class ScriptedDiscTest : public BurnWindowTest {
+protected:
+    void SetUp() override {
+        BurnWindowTest::SetUp();
+        ::setenv("AC_FAKE_RECORDER", (home / "fake.ini").c_str(), 1);
+    }
+    void TearDown() override {
+        ::unsetenv("AC_FAKE_RECORDER");
+        BurnWindowTest::TearDown();
+    }
+    void Disc(const std::string& lines) { std::ofstream(home / "fake.ini") << lines; }
+    std::string RecorderLog() { return ReadText(home / "fake.ini.log"); }
+};
+
+TEST_F(ScriptedDiscTest, WaitingDialogOpensTheTrayAndEndsWhenABlankDiscComes) {
+    WriteSettings(1);
+    Disc("media=8\nstate=2\nfree=300000\n");
+    Program program(home);
+    program.WaitFor([](const State& s) {
+        return Field(s, "burnrecorders") == "2" &&
+               Field(s, "profile").find("WAV") != std::string::npos;
+    });
+    program.Send("burnadd " + tracks[0]);
+    program.WaitFor([](const State& s) { return s.count("burnrow0") > 0; });
+    program.Send("command 33136");
+    State state = program.WaitFor([](const State& s) { return s.count("waitingdisc") > 0; });
+    // Title, message of code -90, disc type, free space, data size, Ignore shown.
+    const std::string dialog = Field(state, "waitingdisc");
+    EXPECT_EQ(dialog.rfind("[fake0] Unknown:Waiting for disc|This disc is not writable.", 0), 0u)
+        << dialog;
+    EXPECT_NE(dialog.find("|CD-ROM|585.94 MB|"), std::string::npos) << dialog;
+    EXPECT_TRUE(dialog.ends_with("|1"));
+    for (int i = 0; i < 50 && RecorderLog().find("eject") == std::string::npos; ++i)
+        std::this_thread::sleep_for(100ms);
+    EXPECT_NE(RecorderLog().find("eject"), std::string::npos) << "the tray opens first";
+
+    // A blank CD-R goes in: the next check ends the dialog and the run writes.
+    Disc("media=9\nstate=0\nfree=300000\nname=FAKE RW\n");
+    program.Send("waitcheck");
+    state = program.WaitFor(
+        [](const State& s) {
+            return s.count("waitingdisc") == 0 && Field(s, "burnactive") == "0" &&
+                   Field(s, "boxes").find("Burning successful") != std::string::npos;
+        },
+        60s);
+    EXPECT_TRUE(fs::exists(home / "fake.cue")) << Field(state, "boxes");
+    EXPECT_NE(RecorderLog().find("before"), std::string::npos);
+}
+
+TEST_F(ScriptedDiscTest, EraseDialogErasesARewritableAndAsksAboutEjecting) {
+    WriteSettings(1);
+    Disc("media=10\nstate=2\nfree=0\nerasable=1\nerasems=1500\n");
+    Program program(home);
+    program.WaitFor([](const State& s) { return Field(s, "burnrecorders") == "2"; });
+    program.Send("command 33082");
+    State state = program.WaitFor([](const State& s) { return s.count("erasedisc") > 0; });
+    EXPECT_EQ(Field(state, "erasedisc"), "0|1|0|0");
+    program.Send("answer yes");
+    program.Send("erase quick");
+    state = program.WaitFor([](const State& s) { return Field(s, "erasedisc").ends_with("|1"); });
+    state = program.WaitFor([](const State& s) {
+        return Field(s, "boxes").find("Erase complete!") != std::string::npos;
+    });
+    EXPECT_NE(RecorderLog().find("erase quick"), std::string::npos);
+    for (int i = 0; i < 20 && RecorderLog().find("eject") == std::string::npos; ++i)
+        std::this_thread::sleep_for(100ms);
+    EXPECT_NE(RecorderLog().find("eject"), std::string::npos);
+    // The dialog stays open for a further erase, its controls enabled again.
+    state = program.WaitFor([](const State& s) { return Field(s, "erasedisc") == "0|1|0|0"; });
+    program.Send("dialog cancel");
+    state = program.WaitFor([](const State& s) { return s.count("erasedisc") == 0; });
+    EXPECT_EQ(state.count("erasedisc"), 0u);
 }
 
 }  // namespace

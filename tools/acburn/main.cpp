@@ -3,7 +3,7 @@
 // a disc image (an audio disc as NAME.bin + NAME.cue, a data disc as NAME.iso).
 //
 //   acburn [--type audio|mp3|wma] [--recorder DEV|--image PATH] [--speed N] [--copies N]
-//          [--gap S] [--label TEXT] [--list-recorders] FILE...
+//          [--gap S] [--label TEXT] [--list-recorders] [--times] FILE...
 //
 // Exit status: 0 only when every copy was written, 1 when a conversion or a write failed,
 // 2 for a usage error or an input that cannot be burnt, 130 after Ctrl-C or SIGTERM (children
@@ -54,7 +54,7 @@ extern "C" void OnStopSignal(int) {
 
 constexpr const char* kUsage =
     "usage: acburn [--type audio|mp3|wma] [--recorder DEV|--image PATH] [--speed N] [--copies N]\n"
-    "              [--gap S] [--label TEXT] [--list-recorders] FILE...\n";
+    "              [--gap S] [--label TEXT] [--list-recorders] [--times] FILE...\n";
 
 struct Options {
     std::string type = "audio";
@@ -65,6 +65,7 @@ struct Options {
     int gap = 2;
     std::string label;
     bool listRecorders = false;
+    bool times = false;
     bool help = false;
     std::vector<std::string> files;
 };
@@ -87,6 +88,8 @@ bool ParseArguments(int argc, char** argv, Options& options) {
             return true;
         } else if (word == "--list-recorders") {
             options.listRecorders = true;
+        } else if (word == "--times") {
+            options.times = true;
         } else if (word == "--type" || word == "--recorder" || word == "--image" ||
                    word == "--speed" || word == "--copies" || word == "--gap" ||
                    word == "--label") {
@@ -136,7 +139,8 @@ void Help() {
         "  --copies N            copies, 1 to 100; the second image is PATH-2\n"
         "  --gap S               seconds of silence between audio tracks, 0 to 10 (default 2)\n"
         "  --label TEXT          volume label of a data disc\n"
-        "  --list-recorders      the recorders found, the disc image last\n\n"
+        "  --list-recorders      the recorders found, the disc image last\n"
+        "  --times               the seconds of the conversion and of the writes, on stderr\n\n"
         "Exit status: 0 when every copy was written, 1 when a conversion or write failed, 2 for a\n"
         "usage error or a file that cannot be burnt, 130 when stopped (Ctrl-C).");
 }
@@ -326,6 +330,9 @@ int main(int argc, char** argv) {
     }
     driver.Join();
     run.Finish();
+    if (options.times)
+        std::fprintf(stderr, "acburn: conversion %.3f s, writing %.3f s\n", driver.ConversionSeconds(),
+                     driver.WriteSeconds());
     if (stopped || g_stopRequested)
         return 130;
     if (!run.AllWritten())

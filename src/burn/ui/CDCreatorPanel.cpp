@@ -492,7 +492,9 @@ bool CCDCreatorPanel::IsCommandEnabled(int id) {
 
 bool CCDCreatorPanel::OnCommand(int id) {
     using namespace burncmd;
-    if (!IsCommandEnabled(id))
+    // The moves run whenever no burn is active: a block at the top simply stays.
+    const bool move = id == kMoveUp || id == kMoveDown;
+    if (move ? m_driver->BurnActive() : !IsCommandEnabled(id))
         return false;
     switch (id) {
         case kAdd:
