@@ -588,11 +588,6 @@ void CCDCreatorPanel::StartBurn() {
         if (MediaItem* item = Item(row))
             seconds += GetEffectiveDuration(*item);
     m_driver->SetCompilation(seconds, m_tally.minutes);
-    if (m_modeHost)
-        if (CapacityBar* gauge = m_modeHost->Gauge()) {
-            gauge->SetPlainRange(0, 100);
-            gauge->SetPosition(0);
-        }
     if (!m_driver->StartBurn())
         RefreshCapacity();
     UpdateButtons();
@@ -669,8 +664,15 @@ void CCDCreatorPanel::SetProgress(int percent) {
     PostToUi([percent](CCDCreatorPanel& self) {
         if (!self.m_modeHost || !self.m_driver->BurnActive())
             return;
-        if (CapacityBar* gauge = self.m_modeHost->Gauge())
-            gauge->SetPosition(percent);
+        CapacityBar* gauge = self.m_modeHost->Gauge();
+        if (gauge == nullptr)
+            return;
+        // The gauge serves as the run's bar from its first step until the run ends.
+        if (!self.m_gaugeShowsRun) {
+            gauge->SetPlainRange(0, 100);
+            self.m_gaugeShowsRun = true;
+        }
+        gauge->SetPosition(percent);
     });
 }
 

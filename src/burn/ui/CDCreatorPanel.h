@@ -208,6 +208,7 @@ private:
     const Profile* m_currentProfile = nullptr;
     burn::CompilationTally m_tally;
     bool m_panelsEnabled = true;
+    bool m_gaugeShowsRun = false;
 
     std::vector<std::unique_ptr<burn::ICdRecorder>> m_recorders;
     std::atomic<int> m_selectedRecorder{-1};

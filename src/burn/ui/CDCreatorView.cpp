@@ -282,6 +282,7 @@ void CCDCreatorPanel::RefreshCapacity() {
     CapacityBar* gauge = m_modeHost ? m_modeHost->Gauge() : nullptr;
     if (gauge == nullptr || m_driver->BurnActive())
         return;
+    m_gaugeShowsRun = false;
     const bool audio = m_modeHost->DiscTypeItem() == 0;
     const burn::CapacityScale scale = burn::ScaleForDisc(audio);
     if (audio) {
@@ -371,13 +372,27 @@ void CCDCreatorPanel::RecalcLayout() {
     if (m_list == nullptr)
         return;
     const wxSize client = GetClientSize();
+    const int room =
+        client.x - 2 * m_endSpacing - m_leftEnd->GetSize().x - m_rightEnd->GetSize().x - 8;
     std::array<wxSize, 7> sizes;
+    // Words beside the glyphs while the row has room for them: first the arrows of the two moves
+    // go without theirs, then every button; each keeps its word as a tool tip.
     int tallest = std::max(m_leftEnd->GetSize().y, m_rightEnd->GetSize().y);
-    for (std::size_t i = 0; i < kButtons.size(); ++i) {
-        FitIconButton(*m_buttons[i], 24);
-        sizes[i] = m_buttons[i]->GetSize();
-        tallest = std::max(tallest, sizes[i].y);
+    for (int wordless = 0; wordless <= 2; ++wordless) {
+        int total = 6 * 12;
+        for (std::size_t i = 0; i < kButtons.size(); ++i) {
+            const bool hide = wordless == 2 || (wordless == 1 && i >= 5);
+            m_buttons[i]->SetTextShown(!hide);
+            m_buttons[i]->SetToolTip(hide ? m_buttons[i]->GetLabel() : wxString());
+            FitIconButton(*m_buttons[i], 24);
+            sizes[i] = m_buttons[i]->GetSize();
+            total += sizes[i].x;
+        }
+        if (total <= room)
+            break;
     }
+    for (const wxSize& size : sizes)
+        tallest = std::max(tallest, size.y);
     const int rowHeight = std::max(tallest, std::min(m_buttonRowHeight, tallest + 16));
     const int rowTop = client.y - m_metrics.BottomMargin - rowHeight;
     const int centre = rowTop + rowHeight / 2;

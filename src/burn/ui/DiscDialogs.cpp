@@ -145,7 +145,11 @@ CWaitingDiscDlg* CWaitingDiscDlg::Shown() {
 void CWaitingDiscDlg::SetCode(int code) {
     m_code = code;
     m_message->SetLabel(wxString::FromUTF8(Text(burn::WaitMessageId(code))));
+    // Messages run to three lines and more in other languages: the dialog grows with them.
+    m_message->Wrap(420);
     RefreshFields();
+    if (GetSizer() != nullptr)
+        GetSizer()->SetSizeHints(this);
 }
 
 void CWaitingDiscDlg::RefreshFields() {
