@@ -319,3 +319,42 @@ TEST_F(ScriptedDiscTest, EraseDialogErasesARewritableAndAsksAboutEjecting) {
 }
 
 }  // namespace
+
+namespace {
+
+// A run in its conversion stage refuses the close; Stop ends it with nothing left behind.
+TEST_F(BurnWindowTest, CloseIsRefusedDuringARunAndStopLeavesNothing) {
+    const std::string tool = home / "slow-ctt";
+    std::ofstream(tool) << "#!/bin/sh\necho '|Time>>> 1'\nexec sleep 60\n";
+    fs::permissions(tool, fs::perms::owner_all);
+    ::setenv("AC_CTT_PATH", tool.c_str(), 1);
+    WriteSettings(1);
+    Program program(home);
+    ::unsetenv("AC_CTT_PATH");
+    AddTracks(program);
+    program.Send("command 33136");
+    State state = program.WaitFor([](const State& s) { return RowField(s, 0, 4).ends_with("%"); });
+    ASSERT_EQ(Field(state, "burnactive"), "1");
+    EXPECT_EQ(Field(state, "tabs").find('+'), std::string::npos)
+        << "the tabs are locked: " << Field(state, "tabs");
+    EXPECT_EQ(Field(state, "burnenabled"), "0000100");
+
+    program.Send("close");
+    state = program.WaitFor([](const State& s) {
+        return Field(s, "boxes").find("Please stop burning first!") != std::string::npos;
+    });
+    EXPECT_TRUE(program.Running());
+
+    program.Send("answer yes");
+    program.Send("command 33077");
+    state = program.WaitFor([](const State& s) { return Field(s, "burnactive") == "0"; }, 30s);
+    EXPECT_NE(Field(state, "boxes").find("Are you sure to stop encoding?"), std::string::npos);
+    EXPECT_EQ(RowField(state, 0, 4), "Abort") << Field(state, "burnrow0");
+    EXPECT_TRUE(TemporaryFolderEmpty());
+    EXPECT_FALSE(fs::exists(home / "out/disc.cue"));
+    EXPECT_NE(Field(state, "tabs").find('+'), std::string::npos);
+    program.Send("close");
+    EXPECT_TRUE(program.WaitForExit());
+}
+
+}  // namespace
