@@ -118,11 +118,34 @@ void CBurnMode::RunEnded(bool allCopiesWritten) {
 }
 
 void CBurnMode::SelectionChanged() {
-    if (g_SideBar == nullptr)
+    if (g_SideBar != nullptr) {
+        const std::vector<ParameterSet*> sets = m_panel.SelectedSets();
+        g_SideBar->SetSets(sets);
+        g_SideBar->FollowSelection(sets);
+    }
+    if (g_StatusWnd == nullptr || m_panel.Driver().BurnActive())
         return;
-    const std::vector<ParameterSet*> sets = m_panel.SelectedSets();
-    g_SideBar->SetSets(sets);
-    g_SideBar->FollowSelection(sets);
+    // Between runs only the selected row's child talks to the status panel and the log, and a
+    // failed row says why.
+    for (int row = 0; row < m_panel.RowCount(); ++row) {
+        if (CEncodeProcess* process = m_panel.Item(row)->process.load())
+            process->Link(nullptr, nullptr);
+    }
+    MediaItem* selected = m_panel.Item(m_panel.FirstSelectedRow());
+    if (selected == nullptr)
+        return;
+    g_StatusWnd->ClearLog();
+    const JobStatus status = selected->Status();
+    CEncodeProcess* process = selected->process.load();
+    if (process != nullptr && status != JobStatus::Idle && status != JobStatus::Waiting &&
+        status != JobStatus::UnknownFile) {
+        process->Link(g_StatusWnd, g_StatusWnd);
+        process->ReplayErrorLines();
+        if (status == JobStatus::Failed)
+            g_StatusWnd->SetStatusText(process->FailureReason());
+    }
+    if (status == JobStatus::UnknownFile && !selected->info.probeError.empty())
+        g_StatusWnd->SetStatusText(selected->info.probeError);
 }
 
 const Profile* CBurnMode::CurrentProfile() {

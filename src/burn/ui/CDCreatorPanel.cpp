@@ -425,6 +425,11 @@ void CCDCreatorPanel::MoveDown() {
     m_list->SetFocus();
 }
 
+int CCDCreatorPanel::FirstSelectedRow() const {
+    const std::vector<int> rows = SelectedRows();
+    return rows.empty() ? -1 : rows.front();
+}
+
 void CCDCreatorPanel::SelectRows(const std::vector<int>& rows) {
     m_list->SelectRow(-1);
     for (int row : rows)

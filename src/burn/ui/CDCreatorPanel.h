@@ -103,6 +103,8 @@ public:
     void MoveDown();
     void SelectAll(bool select);
     void SelectRows(const std::vector<int>& rows);
+    // -1 when nothing is selected.
+    int FirstSelectedRow() const;
     void StartBurn();
     void StopBurn();
     bool IsOwnCommand(int commandId) const;
