@@ -8,11 +8,13 @@ packages=(
   build-essential cmake ninja-build pkg-config ccache clang libclang-rt-14-dev
   # toolkit and libraries
   libwxgtk3.2-dev libgtk-3-dev libzip-dev zlib1g-dev
-  libavformat-dev libavcodec-dev libswresample-dev libavutil-dev
+  libavformat-dev libavcodec-dev libswresample-dev libswscale-dev libavutil-dev
   libcdio-dev libcdio-paranoia-dev libburn-dev libisofs-dev libsdl2-dev libuchardet-dev
   # tests and benchmarks
   googletest libgtest-dev libbenchmark-dev xvfb xauth x11-utils imagemagick ffmpeg hyperfine time
   xorriso
+  # man pages, and the checks of the desktop files and the package
+  scdoc desktop-file-utils appstream lintian bash-completion
 )
 
 sudo_cmd=()

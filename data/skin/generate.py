@@ -220,7 +220,7 @@ THEMES = {
         hover='#E4ECFC', popup='#FFFFFF', popup_border='#C5CEDA', select='#E4ECFC',
         select_text='#1D4ED8', disabled='#9AA4B2', line='#E6EAF0', text='#2A3342',
         muted='#5B6576', radius=8, card_radius=6, tab_up='#EEF1F5', tab_hover='#E2E7EE',
-        status='#E6EAF0', font='Cantarell'),
+        status='#E6EAF0', font='Cantarell', paper='#FFFFFF'),
     'Midnight': dict(
         name='Midnight Teal', bg='#171A21', card='#21262F', border='#323A47',
         accent='#14B8A6', accent_dark='#5EEAD4', cap_top='#0E1116', cap_bottom='#0E1116',
@@ -228,7 +228,7 @@ THEMES = {
         hover='#27303C', popup='#232934', popup_border='#3A4352', select='#134E4A',
         select_text='#99F6E4', disabled='#687384', line='#333B48', text='#E3E6EB',
         muted='#9AA3B1', radius=12, card_radius=10, tab_up='#171A21', tab_hover='#222833',
-        status='#12151B', font='DejaVu Sans'),
+        status='#12151B', font='DejaVu Sans', paper='#E3E6EB'),
 }
 
 CAPTION_H = 32
@@ -480,7 +480,7 @@ def write_skin(key, t):
         size = 28 if name.startswith(('Play', 'Pause', 'Stop')) and 'Play' in name else 36
         write_png(P(name), button_cells(t, size, size, glyph, name in primary))
     bmp_buttons = {'OutputBtn.bmp': g_folder, 'ProfileMenu.bmp': g_dots, 'ShowLog.bmp': g_list,
-                   'BmpBtn.bmp': g_dots, 'CDOpen.bmp': g_eject, 'CDClose.bmp': g_close_tray,
+                   'CDOpen.bmp': g_eject, 'CDClose.bmp': g_close_tray,
                    'mode_adv.bmp': g_plus, 'mode_nor.bmp': g_minus}
     for name, glyph in bmp_buttons.items():
         write_bmp(P(name), button_cells(t, 28, 24, glyph), hexc(t['card']))
@@ -493,9 +493,21 @@ def write_skin(key, t):
     right = Canvas(12, 28)
     right.rrect(-12, 0, 24, 28, t['card_radius'], hexc(t['card']))
     write_png(P('RipRight.png'), right)
-    beer = Canvas(32, 32)
-    g_disc(beer, 16, 16, 11, hexc(t['accent']))
+    # The file information window's frame: a caption band over the card, a hairline border.
+    # Its corner cells (150 by 200) are copied as they are, the middle row and column stretch.
+    beer = Canvas(301, 401, hexc(t['card']))
+    beer.rect(0, 0, 301, 25, vgrad(hexc(t['cap_top']), hexc(t['cap_bottom']), 0, 25))
+    for x, y, w, h in ((0, 0, 301, 1), (0, 400, 301, 1), (0, 0, 1, 401), (300, 0, 1, 401)):
+        beer.rect(x, y, w, h, hexc(t['border']))
     write_bmp(P('Beer1.bmp'), beer, hexc(t['card']))
+    # Its close button stands on the caption band: a cross in the caption's colours.
+    close = Canvas(18, 18 * 4)
+    for i, (fill, ink) in enumerate(((t['cap_hover'], t['cap_text']), (None, t['cap_text']),
+                                     (t['cap_hover'], t['cap_text']), (None, t['disabled']))):
+        if fill:
+            close.rrect(1, i * 18 + 1, 16, 16, 4, hexc(fill))
+        g_cross(close, 9, i * 18 + 9, 5, hexc(ink))
+    write_bmp(P('BmpBtn.bmp'), close, hexc(t['cap_bottom']))
 
     # Sliders, progress and check boxes.
     def bar_piece(h, fill, w=8):
@@ -627,7 +639,8 @@ def write_ini(path, t):
                                           'ProgressBg=ProgressBg.bmp',
                                           'OverflowFore=OverflowFore.bmp',
                                           'NearOverflowFore=NearOverflowFore.bmp']),
-        'FileInfo': [f'BodyBgColor={t["card"]}'],
+        # The page's texts are dark whatever the skin: a dark skin gives it light paper.
+        'FileInfo': [f'BodyBgColor={t["paper"]}'],
     }
     lines = ['; Written by generate.py; edit the generator, not this file.']
     for name, keys in sections.items():

@@ -47,6 +47,9 @@ bool ReadChosen(CCddbClient& client, const LookupSettings& settings,
     observer.ShowAction(ac::g_Language.GetString(text::kReadAction));
     CddbEntry entry;
     if (!client.ReadEntry(settings.host, match.discId, match, entry)) {
+        if (client.LastEntryResult() != EntryResult::Ok) {
+            observer.ShowEntryProblem(EntryResultText(client.LastEntryResult()));
+        }
         return false;
     }
     EntryToDiscInfo(match.category, entry, out);

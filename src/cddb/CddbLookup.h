@@ -36,6 +36,9 @@ public:
     // Asked only with two rows or more; answers a row index (anything out of range takes the
     // first).
     virtual int ChooseMatch(const std::vector<std::string>& rows) = 0;
+    // The server answered, but its disc entry could not be read: why, in words. The window
+    // keeps the raw reply in view and says nothing more, as it always has.
+    virtual void ShowEntryProblem(const std::string& /*reason*/) {}
 };
 
 // Query from the table of contents, choose, read. False, with `out` cleared, when any step

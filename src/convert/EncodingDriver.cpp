@@ -62,7 +62,25 @@ EncodingDriver::EncodingDriver(IMediaList& list, IDriverHost& host, DriverConfig
       m_namer(std::move(namer)),
       m_builder(std::move(builder)),
       m_freeSpace(VolumeFreeBytes),
-      m_afterConvertAction(m_config.afterConvertAction) {}
+      m_afterConvertAction(m_config.afterConvertAction),
+      m_maxProcesses(m_config.maxProcesses),
+      m_maxRunningProcesses(m_config.maxRunningProcesses),
+      m_slowdown(m_config.slowdown),
+      m_idle(m_config.idle) {}
+
+void EncodingDriver::UpdateSettings(int maxProcesses, int maxRunningProcesses, int playSound,
+                                    const std::string& soundPath, bool slowdown, bool idle) {
+    m_slowdown = slowdown;
+    m_idle = idle;
+    m_maxProcesses = maxProcesses;
+    m_maxRunningProcesses = maxRunningProcesses;
+    {
+        std::lock_guard lock(m_soundMutex);
+        m_config.playSound = playSound;
+        m_config.soundPath = soundPath;
+    }
+    Wake();
+}
 
 EncodingDriver::~EncodingDriver() {
     Stop();
@@ -132,7 +150,7 @@ bool EncodingDriver::RunPass() {
         JobStatus status = item->Status();
         if (status == JobStatus::Waiting)
             StartRow(row, *item, proceed, lastOutput);
-        else if (status == JobStatus::Pending && m_runningCount < m_config.maxRunningProcesses)
+        else if (status == JobStatus::Pending && m_runningCount < m_maxRunningProcesses)
             ResumeRow(row, *item);
     }
     m_list.Unlock();
@@ -157,7 +175,7 @@ void EncodingDriver::StartRow(int row, MediaItem& item, bool& proceed, std::stri
         m_list.RefreshRow(row);
         return;
     }
-    if (m_processCount >= m_config.maxProcesses || m_runningCount >= m_config.maxRunningProcesses)
+    if (m_processCount >= m_maxProcesses || m_runningCount >= m_maxRunningProcesses)
         return;
 
     CEncodeProcess* child = item.process.load();
@@ -191,6 +209,7 @@ void EncodingDriver::StartRow(int row, MediaItem& item, bool& proceed, std::stri
     if (m_sweptDirectories.insert(directory).second)
         platform::SweepStalePartFiles(directory);
     child->SetCurrentDirectory(m_config.toolDirectory);
+    child->SetBackgroundPriority(m_slowdown, m_idle);
     child->SetOutputPath(item.outputPath);
     if (!child->Launch("\"" + m_config.toolPath + "\" " + commandText)) {
         item.outputHold.Release();
@@ -507,8 +526,15 @@ double EncodingDriver::GetRunTotalSeconds() {
 
 void EncodingDriver::OnRunFinished() {
     m_runPending = 0;
-    if (m_config.playSound)
-        m_host.PlaySound(m_config.soundPath);
+    int playSound = 0;
+    std::string soundPath;
+    {
+        std::lock_guard lock(m_soundMutex);
+        playSound = m_config.playSound;
+        soundPath = m_config.soundPath;
+    }
+    if (playSound)
+        m_host.PlaySound(soundPath);
     int action = m_afterConvertAction.load();
     if (action >= 0 && action <= 3)
         m_host.StartAfterRunAction(action);

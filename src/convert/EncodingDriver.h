@@ -63,6 +63,9 @@ struct DriverConfig {
     int afterConvertAction = 4;
     int playSound = 0;
     std::string soundPath;
+    // Children as background work: nice 10, SCHED_IDLE (the settings slowdown and idle).
+    bool slowdown = false;
+    bool idle = false;
     std::string toolPath;       // the ctt to run; tests put a fake here
     std::string toolDirectory;  // the child's current directory
     // The longest wait between passes; a child's exit or a command starts a pass sooner.
@@ -139,6 +142,10 @@ public:
     void OnRunFinished();
     // The after-run action chosen in the menu while the program runs.
     void SetAfterConvertAction(int action) { m_afterConvertAction = action; }
+    // New limits and end-of-run sound from the preferences, taken by the next pass of a run
+    // already under way; the tool and its folder stay as they were.
+    void UpdateSettings(int maxProcesses, int maxRunningProcesses, int playSound,
+                        const std::string& soundPath, bool slowdown = false, bool idle = false);
     // The 3-second timer of the main dialog: stops the run when the output volume runs low.
     void CheckDiskSpace();
 
@@ -178,6 +185,11 @@ private:
     std::atomic<int> m_runPending{0};
     std::atomic<int> m_driverStop{0};
     std::atomic<int> m_afterConvertAction{4};
+    std::atomic<int> m_maxProcesses{10};
+    std::atomic<int> m_maxRunningProcesses{1};
+    std::atomic<bool> m_slowdown{false};
+    std::atomic<bool> m_idle{false};
+    std::mutex m_soundMutex;  // guards m_config.playSound and m_config.soundPath
     // One 0x466 per run end, however many passes see the end before the UI thread handles it.
     std::atomic<int> m_finishPosted{0};
 

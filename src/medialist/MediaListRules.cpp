@@ -60,7 +60,10 @@ constexpr std::array<const char*, kFilterEntryCount> kFilterPatterns = {
 }  // namespace
 
 std::string GetDisplayName(std::string_view path) {
-    const std::size_t slash = path.find_last_of("/\\");
+    // A backslash is an ordinary character of a Linux file name; it separates folders only in
+    // a Windows path, as cue sheets written there name their audio files.
+    const bool windowsPath = path.find('/') == std::string_view::npos;
+    const std::size_t slash = path.find_last_of(windowsPath ? "\\" : "/");
     std::string_view name = slash == std::string_view::npos ? path : path.substr(slash + 1);
     const std::size_t dot = name.rfind('.');
     if (dot == std::string_view::npos || name.size() - dot > 5) {

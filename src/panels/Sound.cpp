@@ -1,5 +1,7 @@
 #include "panels/Sound.h"
 
+#include "panels/SdlAudio.h"
+
 #include <SDL.h>
 
 #include <atomic>
@@ -67,13 +69,13 @@ private:
     void Play(const std::string& path) {
         // SDL's set-up and tear-down of the audio subsystem are not safe against each other.
         {
-            std::lock_guard lock(m_sdlMutex);
+            std::lock_guard lock(SdlAudioLock());
             if (SDL_InitSubSystem(SDL_INIT_AUDIO) != 0) {
                 return;
             }
         }
         PlayOpened(path);
-        std::lock_guard lock(m_sdlMutex);
+        std::lock_guard lock(SdlAudioLock());
         SDL_QuitSubSystem(SDL_INIT_AUDIO);
     }
 
@@ -87,7 +89,7 @@ private:
         spec.callback = nullptr;
         SDL_AudioDeviceID device = 0;
         {
-            std::lock_guard lock(m_sdlMutex);
+            std::lock_guard lock(SdlAudioLock());
             device = SDL_OpenAudioDevice(nullptr, 0, &spec, nullptr, 0);
         }
         if (device != 0) {
@@ -103,14 +105,13 @@ private:
             while (!m_stop && SDL_GetQueuedAudioSize(device) > 0 && SDL_GetTicks64() < deadline) {
                 SDL_Delay(20);
             }
-            std::lock_guard lock(m_sdlMutex);
+            std::lock_guard lock(SdlAudioLock());
             SDL_CloseAudioDevice(device);
         }
         SDL_FreeWAV(buffer);
     }
 
     std::mutex m_mutex;
-    std::mutex m_sdlMutex;
     std::atomic<bool> m_stop{false};
     std::list<std::unique_ptr<SoundThread>> m_threads;
 };

@@ -1,5 +1,8 @@
 #include "platform/ChildProcess.h"
 
+#include <sched.h>
+#include <sys/resource.h>
+
 #include "platform/CommandLine.h"
 #include "platform/PartFiles.h"
 
@@ -58,6 +61,8 @@ pid_t ImChildProcess::ProcessId() const {
     return m_pid;
 }
 
+constexpr int kSlowdownNice = 10;
+
 bool ImChildProcess::Launch(const std::string& commandLine, bool /*showWindow*/) {
     JoinThreads();
 
@@ -111,6 +116,14 @@ bool ImChildProcess::Launch(const std::string& commandLine, bool /*showWindow*/)
         return false;
     }
 
+    // Lowering one's own children needs no privilege; a refusal leaves the child at normal
+    // priority, which is no reason to fail the job.
+    if (m_slowdown)
+        ::setpriority(PRIO_PGRP, static_cast<id_t>(pid), kSlowdownNice);
+    if (m_idle) {
+        sched_param param{};
+        ::sched_setscheduler(pid, SCHED_IDLE, &param);
+    }
     {
         std::lock_guard lock(m_mutex);
         m_pid = pid;

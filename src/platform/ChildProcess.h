@@ -60,6 +60,13 @@ public:
     int ExitCode() const { return m_exitCode.load(); }
     pid_t ProcessId() const;
     void SetCurrentDirectory(std::string directory) { m_currentDirectory = std::move(directory); }
+    // Conversions as background work, as the settings "Slowdown Priority" and "Idle Convert"
+    // ask: `slowdown` runs the child's process group at nice 10, `idle` under SCHED_IDLE, so
+    // a desktop stays responsive while every core converts.
+    void SetBackgroundPriority(bool slowdown, bool idle) {
+        m_slowdown = slowdown;
+        m_idle = idle;
+    }
 
 protected:
     virtual void OnStart(const std::string& /*commandLine*/) {}
@@ -78,6 +85,8 @@ private:
     void JoinThreads();
     void CloseWakePipe();
 
+    bool m_slowdown = false;
+    bool m_idle = false;
     std::string m_currentDirectory;
     std::string m_outputPath;  // guarded by m_mutex
 

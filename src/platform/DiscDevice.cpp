@@ -145,6 +145,23 @@ int CorrectCdrdaoLeadOut(const CdIo_t* handle, track_t first, track_t last, int 
 // Reads the table and refuses one that no disc could have: a broken image (a .bin shorter than
 // its cue, a toc whose data file libcdio places at 0) must not reach the track list or the
 // disc id as if it were a disc.
+// CD-Text in the first language block that has any; a disc without it leaves the texts empty.
+void ReadCdText(const CdIo_t* handle, DiscTable& table) {
+    cdtext_t* text = cdio_get_cdtext(const_cast<CdIo_t*>(handle));
+    if (text == nullptr) {
+        return;
+    }
+    auto field = [text](cdtext_field_t which, track_t track) {
+        const char* value = cdtext_get_const(text, which, track);
+        return value == nullptr ? std::string() : std::string(value);
+    };
+    table.cdTextAlbum = field(CDTEXT_FIELD_TITLE, 0);
+    table.cdTextArtist = field(CDTEXT_FIELD_PERFORMER, 0);
+    for (const TocTrack& track : table.tracks) {
+        table.cdTextTitles.push_back(field(CDTEXT_FIELD_TITLE, static_cast<track_t>(track.number)));
+    }
+}
+
 bool ReadTable(const CdIo_t* handle, bool cdrdao, DiscTable& table) {
     const track_t first = cdio_get_first_track_num(handle);
     const track_t last = cdio_get_last_track_num(handle);
@@ -173,6 +190,7 @@ bool ReadTable(const CdIo_t* handle, bool cdrdao, DiscTable& table) {
         return false;
     }
     read.leadOutLba = leadOut;
+    ReadCdText(handle, read);
     table = std::move(read);
     return true;
 }
@@ -341,6 +359,17 @@ std::string JoinImageList(const std::vector<std::string>& images) {
         text += image;
     }
     return text;
+}
+
+bool DiscTable::HasCdText() const {
+    if (!cdTextAlbum.empty() || !cdTextArtist.empty()) {
+        return true;
+    }
+    for (const std::string& title : cdTextTitles) {
+        if (!title.empty())
+            return true;
+    }
+    return false;
 }
 
 }  // namespace ac::platform

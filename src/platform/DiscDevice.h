@@ -30,6 +30,12 @@ struct DiscTable {
     int lastTrack = 0;
     std::vector<TocTrack> tracks;
     int leadOutLba = 0;
+    // The disc's CD-Text, when it carries any (a pressed CD's, or TITLE and PERFORMER lines of
+    // a cue sheet): the album's title and performer, and one title per entry of `tracks`.
+    std::string cdTextAlbum;
+    std::string cdTextArtist;
+    std::vector<std::string> cdTextTitles;
+    bool HasCdText() const;
 };
 
 class IDiscDevice {

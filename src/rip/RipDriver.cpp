@@ -309,6 +309,7 @@ void RipDriver::StartTrack(int row) {
     });
     m_child->Link(m_host.Log(), m_host.Status());
     m_child->SetCurrentDirectory(m_settings.toolDirectory);
+    m_child->SetBackgroundPriority(m_settings.slowdown, m_settings.idle);
     m_child->SetOutputPath(m_outputHold.Path());
     m_list.SetStatus(row, RipStatus::Running, 0);
     m_toolRunning = true;

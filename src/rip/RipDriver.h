@@ -82,6 +82,8 @@ struct RipSettings {
     NamingSettings naming;
     std::string toolPath;
     std::string toolDirectory;  // the child's working directory
+    bool slowdown = false;      // the tool at nice 10
+    bool idle = false;          // the tool under SCHED_IDLE
 };
 
 // The exit code a stopped child reports: the row is stopped, not failed.

@@ -71,4 +71,28 @@ std::vector<TrackRow> BuildTrackRows(const platform::DiscTable& table, const std
     return rows;
 }
 
+bool RecordFromCdText(const platform::DiscTable& table, cddb::CDDiscInfo& record) {
+    if (!table.HasCdText()) {
+        return false;
+    }
+    record.Clear();
+    record.artist = table.cdTextArtist;
+    record.album = table.cdTextAlbum;
+    for (std::size_t i = 0; i < table.tracks.size(); ++i) {
+        if (table.tracks[i].isData)
+            continue;
+        record.titles.push_back(i < table.cdTextTitles.size() ? table.cdTextTitles[i]
+                                                              : std::string());
+    }
+    record.trackCount = static_cast<int>(record.titles.size());
+    record.Fit();
+    return true;
+}
+
+bool CdTextBeforeLocalRecord(int cddbOrder) {
+    // 0 Local-Remote-CD-Text, 1 Local-CD-Text-Remote, 2 Remote-Local-CD-Text,
+    // 3 Remote-CD-Text-Local, 4 CD-Text-Local-Remote, 5 CD-Text-Remote-Local.
+    return cddbOrder == 3 || cddbOrder == 4 || cddbOrder == 5;
+}
+
 }  // namespace ac

@@ -48,6 +48,14 @@ struct TrackRow {
 // One row per audio track, in disc order. A track runs to the next entry of the table, so the
 // last audio track before a data track ends where the data track starts. The title is the
 // record's title of the track when there is a record and the title is not empty.
+// The disc's CD-Text as a record: performer and album title, one title per audio track (a data
+// track has no row). False when the disc carries no CD-Text.
+bool RecordFromCdText(const platform::DiscTable& table, cddb::CDDiscInfo& record);
+// Where a disc that just loaded takes its names from, by the setting cddborder: the local record
+// and CD-Text in the order it gives (the remote server is asked by the CDDB button only).
+// True when CD-Text comes before the local record.
+bool CdTextBeforeLocalRecord(int cddbOrder);
+
 std::vector<TrackRow> BuildTrackRows(const platform::DiscTable& table, const std::string& drive,
                                      const cddb::CDDiscInfo* record);
 

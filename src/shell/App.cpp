@@ -1,7 +1,10 @@
 // The program's entry, in this order: product strings and the language, the single-instance
-// check, then the main window. A second start ends here silently.
+// check, then the main window. A second start hands the files of its command line to the first
+// copy, which brings its window to the front, and ends.
 
+#include "platform/InstanceChannel.h"
 #include "platform/Paths.h"
+#include "platform/UiQueue.h"
 #include "resources/Language.h"
 #include "resources/TextFormat.h"
 #include "shell/AppConfig.h"
@@ -15,7 +18,13 @@ extern "C" {
 #include <wx/snglinst.h>
 #include <wx/wx.h>
 
+#include <cstdio>
+#include <cstring>
 #include <memory>
+#include <string>
+#include <sys/stat.h>
+#include <unistd.h>
+#include <vector>
 
 namespace {
 
@@ -60,6 +69,36 @@ void IgnoreMenuIdAssert(const wxString& file, int line, const wxString& function
     }
 }
 
+// The command line as bytes: wx would turn it into wide text through the locale and lose the
+// bytes of names that are not UTF-8.
+std::vector<std::string> g_openPaths;
+bool g_handedOver = false;
+
+// Every argument is a file to open; the program takes no switches, so a word starting with '-'
+// that names no file is refused. Relative names are made absolute here: the first copy that
+// may receive them runs in another folder.
+void TakeCommandLine(int argc, char** argv) {
+    std::string cwd;
+    if (char* here = ::getcwd(nullptr, 0)) {
+        cwd = here;
+        std::free(here);
+    }
+    for (int i = 1; i < argc; ++i) {
+        std::string path = argv[i];
+        struct stat info;
+        if (path.empty() || (path[0] == '-' && ::stat(path.c_str(), &info) != 0)) {
+            std::fprintf(stderr,
+                         "audio-converter: %s is not a file; the program takes no options\n",
+                         path.c_str());
+            continue;
+        }
+        if (path[0] != '/' && !cwd.empty()) {
+            path = cwd + "/" + path;
+        }
+        g_openPaths.push_back(std::move(path));
+    }
+}
+
 class CAudioEncApp : public wxApp {
 public:
     bool OnInit() override {
@@ -76,8 +115,17 @@ public:
         const std::string lockDir = ac::platform::UserDataDirectory();
         ac::platform::EnsureDirectory(lockDir);
         m_instance = std::make_unique<wxSingleInstanceChecker>();
-        if (!m_instance->Create("cd-burner", wxString::FromUTF8(lockDir)) ||
-            m_instance->IsAnotherRunning()) {
+        const std::string socketPath = ac::platform::InstanceSocketPath();
+        if (!m_instance->Create("cd-burner", wxString::FromUTF8(lockDir))) {
+            return false;
+        }
+        if (m_instance->IsAnotherRunning()) {
+            g_handedOver = ac::platform::SendPaths(socketPath, g_openPaths);
+            if (!g_handedOver) {
+                std::fprintf(stderr,
+                             "audio-converter: another copy is running but did not take "
+                             "the files\n");
+            }
             return false;
         }
 
@@ -93,18 +141,39 @@ public:
         dialog->OnInitDialog();
         dialog->Show();
         ac::StartTestHook(dialog);
+        dialog->OpenFiles(g_openPaths);
+        m_listener.Start(socketPath, [dialog](std::vector<std::string> paths) {
+            ac::UiQueue::Post([dialog, paths = std::move(paths)] {
+                // A hand-over that arrives while the window closes finds no window to open in.
+                if (wxTheApp->GetTopWindow() == dialog && !dialog->IsBeingDeleted()) {
+                    dialog->OpenFiles(paths);
+                }
+            });
+        });
         return true;
     }
 
     int OnExit() override {
+        m_listener.Stop();
         m_instance.reset();
         return wxApp::OnExit();
     }
 
 private:
     std::unique_ptr<wxSingleInstanceChecker> m_instance;
+    ac::platform::InstanceListener m_listener;
 };
 
 }  // namespace
 
-wxIMPLEMENT_APP(CAudioEncApp);
+wxIMPLEMENT_APP_NO_MAIN(CAudioEncApp);
+
+int main(int argc, char** argv) {
+    TakeCommandLine(argc, argv);
+    // The arguments are files, taken above as bytes; wx and GTK would try to read them as text
+    // and as their own switches.
+    int wxArgc = 1;
+    const int code = wxEntry(wxArgc, argv);
+    // A start that handed its files to the running copy did what was asked of it.
+    return g_handedOver ? 0 : code;
+}

@@ -1,3 +1,4 @@
+#include "shell/Preferences.h"
 #include "shell/AudioEncDlg.h"
 
 #include "burn/ui/CDCreatorPanel.h"
@@ -5,6 +6,8 @@
 
 #include "medialist/ui/MediaListWnd.h"
 #include "medialist/ui/OutputPanelWnd.h"
+#include "panels/FileInfoWnd.h"
+#include "panels/PlayerWnd.h"
 #include "panels/ProgramDialogs.h"
 #include "panels/StatusWnd.h"
 #include "platform/DiscDevice.h"
@@ -19,6 +22,7 @@
 #include "shell/ConvertMode.h"
 #include "shell/MenuTables.h"
 #include "shell/MessageBoxes.h"
+#include "shell/PlayerLists.h"
 #include "shell/ProgramIcon.h"
 #include "shell/RipMode.h"
 #include "convert/RowParameters.h"
@@ -39,6 +43,7 @@
 #include <wx/utils.h>
 
 #include <algorithm>
+#include <sys/stat.h>
 #include <sstream>
 
 namespace ac {
@@ -50,6 +55,7 @@ namespace {
 // Free space below which a burn stops: 200 MB.
 constexpr long long kLowDiskBytes = 209715200LL;
 constexpr int kPlayerHeight = 280;
+constexpr std::uint32_t kFilesRefusedDuringRunId = 0xC185;
 
 // afterconvert keeps 0 shut down, 1 standby, 2 hibernate, 3 exit, 4 none; the menu lists
 // No action, Shut Down, Hibernate, Standby, Kill me.
@@ -168,9 +174,13 @@ void CAudioEncDlg::CreatePanels() {
     m_panels[SideBar] = new CSideBarWnd(this);
     m_panels[MediaList] = new CMediaListWnd(this);
     m_panels[Output] = new COutputPanelWnd(this);
-    m_panels[Player] = new ImSkinPanel(this, 1008, "PlayerPanel");
+    auto* player = new CPlayerWnd(this);
+    player->SetModeList(0, &ConvertPreviewList());
+    player->SetModeList(1, &RipPreviewList());
+    m_panels[Player] = player;
     m_panels[Rip] = new CDRipDlg(this, platform::MakeDiscDevice());
     m_panels[Player]->SetSize(-1, kPlayerHeight);
+    new CFileInfoWnd(this);  // hidden until Show File Information; goes with this window
 }
 
 int CAudioEncDlg::GetWorkMode() const {
@@ -279,6 +289,10 @@ void CAudioEncDlg::OnInitMenuPopup(wxMenu* menu) {
         }
     }
     ApplyEnableRules(*menu);
+    if (wxMenuItem* info = menu->FindChildItem(CFileInfoWnd::kCommandId);
+        info != nullptr && info->IsCheckable() && g_FileInfoWnd != nullptr) {
+        info->Check(g_FileInfoWnd->IsShown());
+    }
     for (int id = cmd::kAfterFirst; id <= cmd::kAfterLast; ++id) {
         if (wxMenuItem* item = menu->FindChildItem(id)) {
             item->Check(kAfterConvertOfCommand[id - cmd::kAfterFirst] == m_afterConvert);
@@ -296,6 +310,9 @@ void CAudioEncDlg::OnLanguageChanged() {
 void CAudioEncDlg::OnLanguageCommand() {
     LoadModeMenu(GetWorkMode());
     OnLanguageChanged();
+    if (g_FileInfoWnd != nullptr) {
+        g_FileInfoWnd->OnLanguageChanged();
+    }
     // Skins may carry language variants of their pictures and keys.
     g_Skin.SetSkin(g_Skin.GetSkinName());
     Refresh();
@@ -472,6 +489,13 @@ void CAudioEncDlg::OnCommand(wxCommandEvent& event) {
         }
         return;
     }
+    // Show File Information serves every mode: the window shows whatever row it was given.
+    if (id == CFileInfoWnd::kCommandId && g_FileInfoWnd != nullptr) {
+        if (IsCommandEnabled(id)) {
+            g_FileInfoWnd->ShowInfo(true);
+        }
+        return;
+    }
     if (m_rip && GetWorkMode() == 1 && m_rip->IsOwnCommand(id)) {
         m_rip->OnCommand(id);
         return;
@@ -485,6 +509,9 @@ void CAudioEncDlg::OnCommand(wxCommandEvent& event) {
         if (GetWorkMode() == 0) {
             m_convert->OnCommand(id);
         }
+        return;
+    }
+    if (g_PlayerWnd != nullptr && g_PlayerWnd->OnCommand(id)) {
         return;
     }
     switch (id) {
@@ -506,6 +533,11 @@ void CAudioEncDlg::OnCommand(wxCommandEvent& event) {
             LoadModeMenu(GetWorkMode());
             return;
         }
+        case cmd::kPreferences: {
+            CPreferencesSheet sheet(this, [this] { OnPreferencesApplied(); });
+            sheet.ShowModal();
+            return;
+        }
         case cmd::kContents:
             OpenHelpPage(GetAppConfig().GetBaseDirectory() + "/help/Default.htm", this);
             return;
@@ -520,6 +552,53 @@ void CAudioEncDlg::OnCommand(wxCommandEvent& event) {
             // Commands of the list panels arrive here once those panels exist.
             event.Skip();
             return;
+    }
+}
+
+void CAudioEncDlg::OnPreferencesApplied() {
+    m_afterConvert = GetAppConfig().GetInt("afterconvert");
+    if (m_convert) {
+        m_convert->SetAfterConvertAction(m_afterConvert);
+        m_convert->ReloadSettings();
+    }
+    if (m_rip) {
+        m_rip->SetAfterRunAction(m_afterConvert);
+    }
+    if (g_RipDlg != nullptr) {
+        g_RipDlg->ReadSettings();
+    }
+}
+
+void CAudioEncDlg::OpenFiles(const std::vector<std::string>& paths) {
+    if (IsIconized()) {
+        Iconize(false);
+    }
+    Show();
+    Raise();
+    if (paths.empty() || g_MediaList == nullptr) {
+        return;
+    }
+    // Rows take the selected profile, which the side bar loads after the window shows.
+    if (g_SideBar == nullptr || !g_SideBar->IsLoaded()) {
+        m_pendingOpen.insert(m_pendingOpen.end(), paths.begin(), paths.end());
+        return;
+    }
+    if (IsConvertRunActive()) {
+        // Rows added under a running driver would change the run the user started.
+        SetStatusText(g_Language.GetString(kFilesRefusedDuringRunId));
+        return;
+    }
+    if (GetWorkMode() != 0) {
+        SwitchMode(0);
+    }
+    for (const std::string& path : paths) {
+        struct stat info;
+        // A folder opens as the Add Folder button opens one: its media files, one level deep.
+        if (::stat(path.c_str(), &info) == 0 && S_ISDIR(info.st_mode)) {
+            g_MediaList->AddFolder(path, -1);
+        } else {
+            g_MediaList->AddFile(path, -1);
+        }
     }
 }
 

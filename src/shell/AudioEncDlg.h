@@ -48,6 +48,11 @@ public:
 
     // Clicking a tab: the panel, the menu and last_run_function follow the mode.
     void SwitchMode(int mode);
+    // Files named on the command line of this start or handed over by a later one: they join
+    // the convert list, and the window comes to the front.
+    void OpenFiles(const std::vector<std::string>& paths);
+    // After the preferences wrote settings: every running copy reads them again.
+    void OnPreferencesApplied();
     int GetWorkMode() const;
 
     // IMainHub: how the panels reach each other (AudioEncHub.cpp).
@@ -77,6 +82,7 @@ public:
     double RipTotalSeconds() override;
 
 private:
+    std::vector<std::string> m_pendingOpen;  // files to open once the profiles are loaded
     friend class CTestHook;
 
     enum Panel { MediaList, Creator, Output, Player, Rip, SideBar, Status, PanelCount };

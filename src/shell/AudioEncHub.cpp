@@ -3,6 +3,7 @@
 
 #include "convert/RowParameters.h"
 #include "medialist/ui/MediaListWnd.h"
+#include "panels/FileInfoWnd.h"
 #include "panels/StatusWnd.h"
 #include "profile/ParameterSet.h"
 #include "profile/ui/SideBarWnd.h"
@@ -18,6 +19,7 @@
 #include <wx/menu.h>
 
 #include <strings.h>
+#include <utility>
 
 namespace ac {
 
@@ -63,6 +65,14 @@ void CAudioEncDlg::ShowContextMenu(wxWindow* owner, int menuId) {
 
 void CAudioEncDlg::OnListSelectionChanged(int row) {
     const int mode = GetWorkMode();
+    if (mode == 0 && g_MediaList != nullptr) {
+        // The file information follows the selection: the row that became selected, or with
+        // none left the empty page.
+        const int shown = row >= 0 ? row : g_MediaList->GetFirstSelected();
+        ShowFileInfo(shown >= 0 ? g_MediaList->GetItem(shown) : nullptr);
+    } else if (mode == 1) {
+        ShowFileInfo(nullptr);  // tracks of a disc carry no probed details
+    }
     if (mode != 0 || g_MediaList == nullptr) {
         return;
     }
@@ -165,8 +175,10 @@ void CAudioEncDlg::SetBitRateAllowed(bool allowed) {
     }
 }
 
-void CAudioEncDlg::ShowFileInfo(MediaItem* /*item*/) {
-    // The file information window is not part of this build yet.
+void CAudioEncDlg::ShowFileInfo(MediaItem* item) {
+    if (g_FileInfoWnd != nullptr) {
+        g_FileInfoWnd->SetItem(item != nullptr ? &item->info : nullptr);
+    }
 }
 
 bool CAudioEncDlg::IsBitRateFree(const std::string& extension) {
@@ -245,6 +257,9 @@ void CAudioEncDlg::OnCatalogueLoaded() {
     }
     // The side bar may now want more room for its longest profile name.
     RecalcLayout();
+    if (!m_pendingOpen.empty()) {
+        OpenFiles(std::exchange(m_pendingOpen, {}));
+    }
 }
 
 std::vector<ParameterSet*> CAudioEncDlg::SelectedSets() {

@@ -69,6 +69,8 @@ DriverConfig ReadDriverConfig() {
     driver.afterConvertAction = config.GetInt("afterconvert");
     driver.playSound = config.GetInt("playsound");
     driver.soundPath = config.GetString("last_wavopenpath");
+    driver.slowdown = config.GetInt("slowdown") != 0;
+    driver.idle = config.GetInt("idle") != 0;
     driver.toolPath = platform::FindConversionTool();
     driver.toolDirectory = config.GetBaseDirectory();
     return driver;
@@ -103,6 +105,14 @@ void CConvertMode::Start() {
     m_driver = std::make_unique<EncodingDriver>(*g_MediaList, *this, ReadDriverConfig(),
                                                 std::move(namer), std::move(builder));
     m_driver->Start();
+}
+
+void CConvertMode::ReloadSettings() {
+    if (m_driver) {
+        const DriverConfig config = ReadDriverConfig();
+        m_driver->UpdateSettings(config.maxProcesses, config.maxRunningProcesses, config.playSound,
+                                 config.soundPath, config.slowdown, config.idle);
+    }
 }
 
 void CConvertMode::Shutdown() {
@@ -171,7 +181,7 @@ bool CConvertMode::OnCommand(int commandId) {
         case id::kSelectAll: list.SelectAll(true); break;
         case id::kSelectNone: list.SelectAll(false); break;
         case id::kConfigureToAll: list.ConfigureToAll(); break;
-        case id::kShowFileInfo: break;  // the file information window comes with its panel
+        case id::kShowFileInfo: break;  // the main dialog shows the file information window
         default: return false;
     }
     m_driver->UpdateCheckingEnabled();

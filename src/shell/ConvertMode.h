@@ -40,6 +40,8 @@ public:
     void CheckDiskSpace();
     void SetWorkMode(int mode) { m_workMode = mode; }
     void SetAfterConvertAction(int action);
+    // The limits and the end-of-run sound as the settings now say, for a run under way too.
+    void ReloadSettings();
 
     EncodingDriver* Driver() { return m_driver.get(); }
     // "12 of 40 files converted", for the status bar while a run goes on.

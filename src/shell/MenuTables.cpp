@@ -59,7 +59,7 @@ const MenuRow kConvertRows[] = {
     {1, Row::Command, 33056, "Select &None"},
     {1, Row::Separator, 0, ""},
     {1, Row::Command, 33065, "Configure To All"},
-    {1, Row::Command, 33045, "Show File Infomation"},
+    {1, Row::Check, 33045, "Show File Infomation"},
     {0, Row::Caption, 0, "&Convert"},
     {1, Row::Command, 32776, "&Encode Checked Items"},
     {1, Row::Command, 32777, "&Pause Checked Items"},
@@ -111,7 +111,7 @@ const MenuRow kBurnRows[] = {
     {1, Row::Command, 33055, "Select &All"},
     {1, Row::Command, 33056, "Select &None"},
     {1, Row::Separator, 0, ""},
-    {1, Row::Command, 33045, "Show File Infomation"},
+    {1, Row::Check, 33045, "Show File Infomation"},
     {0, Row::Caption, 0, "&Burn"},
     {1, Row::Command, 33136, "Burn CD"},
     {1, Row::Command, 33077, "Stop Burn CD"},
@@ -132,7 +132,7 @@ const MenuRow kMediaListContextRows[] = {
     {0, Row::Command, 33055, "Select &All"},
     {0, Row::Command, 33056, "Select &None"},
     {0, Row::Command, 33065, "Configure To All"},
-    {0, Row::Command, 33045, "Show File Infomation"},
+    {0, Row::Check, 33045, "Show File Infomation"},
 };
 
 const MenuRow kRipListContextRows[] = {
@@ -146,7 +146,7 @@ const MenuRow kRipListContextRows[] = {
 const MenuRow kBurnListContextRows[] = {
     {0, Row::Command, 33136, "Burn CD"}, {0, Row::Command, 33077, "Stop Burn CD"},
     {0, Row::Command, 32771, "&Add..."}, {0, Row::Command, 32772, "&Remove"},
-    {0, Row::Command, 32773, "&Clear"},  {0, Row::Command, 33045, "Show File Infomation"},
+    {0, Row::Command, 32773, "&Clear"},  {0, Row::Check, 33045, "Show File Infomation"},
 };
 
 const MenuRow kTrayRows[] = {

@@ -1,3 +1,4 @@
+#include "shell/Preferences.h"
 #include "shell/TestHook.h"
 
 #include "burn/ui/CDCreatorPanel.h"
@@ -12,6 +13,8 @@
 #include "medialist/ui/MediaListWnd.h"
 #include "medialist/ui/OutputPanelWnd.h"
 #include "panels/FileAddErrorWnd.h"
+#include "panels/FileInfoWnd.h"
+#include "panels/PlayerWnd.h"
 #include "panels/StatusWnd.h"
 #include "profile/ParameterSet.h"
 #include "profile/ui/ParameterGrid.h"
@@ -143,6 +146,9 @@ std::string CTestHook::DescribeState(const CAudioEncDlg& dlg) {
     out << "corners=" << (dlg.HasFlag(wxFRAME_SHAPED) ? 1 : 0) << "\n";
     out << "maximized=" << (dlg.IsMaximized() ? 1 : 0) << "\n";
     DescribePanels(dlg, out);
+    if (const CPreferencesSheet* sheet = CPreferencesSheet::Shown()) {
+        out << sheet->Describe();
+    }
     out << "firstpaint_ms=" << dlg.m_firstPaintMs << "\n";
     out << "resize_ms=" << dlg.m_lastBench << "\n";
     return out.str();
@@ -238,6 +244,14 @@ void CTestHook::DescribePanels(const CAudioEncDlg& dlg, std::ostream& out) {
     if (g_StatusWnd != nullptr) {
         out << g_StatusWnd->DescribeState() << "\n";
     }
+    if (g_PlayerWnd != nullptr) {
+        out << g_PlayerWnd->DescribeState();
+    }
+    if (g_FileInfoWnd != nullptr) {
+        out << "fileinfo_shown=" << (g_FileInfoWnd->IsShown() ? 1 : 0) << "\n";
+        out << "fileinfo_bytes=" << g_FileInfoWnd->PageText().size() << "\n";
+        out << "fileinfo_ms=" << g_FileInfoWnd->LastShowMs() << "\n";
+    }
     std::string boxes;
     for (std::string text : ShownBoxes()) {
         std::replace(text.begin(), text.end(), '\n', ' ');
@@ -325,6 +339,19 @@ void CTestHook::RunScriptCommand(CAudioEncDlg& dlg, const std::string& line) {
             }
             break;
         }
+    } else if (verb == "prefset" && CPreferencesSheet::Shown() != nullptr) {
+        // prefset PAGE ID VALUE: a control of a preferences page set as a user would.
+        std::size_t page = 0;
+        int id = 0;
+        in >> page >> id;
+        std::string value;
+        std::getline(in >> std::ws, value);
+        const auto pages = CPreferencesSheet::Shown()->Pages();
+        if (page < pages.size()) {
+            pages[page]->SetControl(id, value);
+        }
+    } else if (verb == "prefapply" && CPreferencesSheet::Shown() != nullptr) {
+        CPreferencesSheet::Shown()->ApplyAll();
     } else if (verb == "saveas" && g_SideBar != nullptr) {
         g_SideBar->SaveProfile(true);
     } else if (verb == "rename" && g_SideBar != nullptr) {
@@ -384,6 +411,11 @@ void CTestHook::RunScriptCommand(CAudioEncDlg& dlg, const std::string& line) {
     } else if (verb == "command") {
         int id = 0;
         in >> id;
+        // 1012 is also the conversion list's Stop button: it goes to the player while that plays.
+        if (g_PlayerWnd != nullptr && (id != CPlayerWnd::kStopId || g_PlayerWnd->IsPlaying()) &&
+            g_PlayerWnd->OnCommand(id)) {
+            return;
+        }
         wxCommandEvent command(wxEVT_MENU, id);
         dlg.OnCommand(command);
     } else if (verb == "skin") {

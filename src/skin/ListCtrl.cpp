@@ -8,6 +8,20 @@
 
 namespace ac {
 
+namespace {
+
+// Cells show file names, and a name on disk may be any bytes: one that is not UTF-8 is shown as
+// Latin-1, the old encoding such names usually come from, rather than as nothing at all.
+wxString CellText(const std::string& text) {
+    const wxString utf8 = wxString::FromUTF8(text);
+    if (!utf8.empty() || text.empty()) {
+        return utf8;
+    }
+    return wxString(text.c_str(), wxConvISO8859_1, text.size());
+}
+
+}  // namespace
+
 wxDEFINE_EVENT(EVT_XLIST_HEADER_CHECK, wxCommandEvent);
 
 namespace {
@@ -507,7 +521,7 @@ void XListBody::DrawCell(wxDC& dc, const wxRect& rect, const XListCell& cell,
     }
     dc.SetTextForeground(selected ? wxSystemSettings::GetColour(wxSYS_COLOUR_HIGHLIGHTTEXT) : text);
     // One measure per cell: the fit test gives the height that centres the line as well.
-    const wxString full = wxString::FromUTF8(cell.text);
+    const wxString full = CellText(cell.text);
     const wxSize extent = MeasureText(dc, cell.text, full);
     const wxString label = extent.x <= textRect.width
                                ? full

@@ -247,7 +247,8 @@ void ImSlider::OnPaint(wxPaintEvent& /*event*/) {
         };
         dc.SetFont(GetFont());
         dc.SetTextForeground(m_textColour);
-        const wxString label = clock(m_pos) + "/" + clock(m_total);
+        // The preview's position runs in milliseconds, its total in seconds.
+        const wxString label = clock(m_pos / 1000) + "/" + clock(m_total);
         dc.DrawText(label, (w - dc.GetTextExtent(label).x) / 2, 0);
     }
 }

@@ -168,6 +168,23 @@ TEST_F(EncodingDriverTest, HangingAndExternallyKilledChildrenEndTheirRowsOnly) {
     EXPECT_FALSE(fs::exists(victim.outputPath));
 }
 
+// The preferences change the limits of a run already under way: its next pass starts more.
+TEST_F(EncodingDriverTest, NewLimitsReachARunUnderWay) {
+    MediaItem& first = Add("gate-a.wav");
+    MediaItem& second = Add("gate-b.wav");
+    MediaItem& third = Add("gate-c.wav");
+    driver->EncodeChecked();
+    ASSERT_TRUE(DriveTo(first, JobStatus::Running));
+    driver->RunPass();
+    EXPECT_EQ(driver->RunningCount(), 1) << "one at a time, as configured";
+    EXPECT_NE(second.Status(), JobStatus::Running);
+    driver->UpdateSettings(10, 3, 0, "");
+    ASSERT_TRUE(Drive([&] { return driver->RunningCount() == 3; }));
+    EXPECT_EQ(third.Status(), JobStatus::Running);
+    for (const char* gate : {"gate-a.wav", "gate-b.wav", "gate-c.wav"}) OpenGate(gate);
+    ASSERT_TRUE(DriveTo(third, JobStatus::Completed));
+}
+
 TEST_F(EncodingDriverTest, PausingFreesTheRunningSlotAndResumeWaitsAsPending) {
     MediaItem& first = Add("gate-a.wav");
     MediaItem& second = Add("gate-b.wav");

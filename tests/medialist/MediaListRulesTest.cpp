@@ -17,6 +17,7 @@ TEST(MediaListRules, DisplayNameDropsOnlyAShortExtension) {
     EXPECT_EQ(GetDisplayName("C:\\Music\\old.wav"), "old") << "a Windows path from a cue sheet";
     EXPECT_EQ(GetDisplayName("/a.dir/file"), "file") << "a dot in a folder is not the name's";
     EXPECT_EQ(GetDisplayName("/music/.ogg"), "") << "a bare short extension leaves nothing";
+    EXPECT_EQ(GetDisplayName("/music/AC\\DC live.flac"), "AC\\DC live") << "a Linux name may hold one";
 }
 
 TEST(MediaListRules, ExtensionIsTheTextBehindTheLastDot) {

@@ -12,6 +12,9 @@
 #include <fstream>
 #include <mutex>
 #include <thread>
+#include <sched.h>
+#include <sstream>
+#include <sys/resource.h>
 #include <sys/wait.h>
 
 namespace ac::platform {
@@ -73,6 +76,31 @@ TEST_F(ChildProcessTest, WordsDirectoryAndExitCodeReachTheChild) {
     EXPECT_EQ(child.Out(), "[-i][a b.wav][][last]" + dir.Path() + "\n");
     EXPECT_EQ(child.Exits(), std::vector<int>{7});
     EXPECT_FALSE(child.IsRunning());
+}
+
+// Fields of /proc/PID/stat behind the command's closing parenthesis, counted from 3 (the state).
+std::vector<std::string> StatFields(int pid) {
+    std::ifstream in("/proc/" + std::to_string(pid) + "/stat");
+    std::string text((std::istreambuf_iterator<char>(in)), std::istreambuf_iterator<char>());
+    std::istringstream rest(text.substr(text.rfind(')') + 2));
+    std::vector<std::string> fields{"", "", ""};
+    for (std::string field; rest >> field;) fields.push_back(field);
+    return fields;
+}
+
+TEST_F(ChildProcessTest, BackgroundWorkRunsNicedAndIdleAndOrdinaryWorkDoesNot) {
+    for (const bool background : {true, false}) {
+        Capture child;
+        child.SetBackgroundPriority(background, background);
+        ASSERT_TRUE(child.Launch(Tool("exec sleep 60\n")));
+        const std::vector<std::string> fields = StatFields(child.ProcessId());
+        ASSERT_GT(fields.size(), 41u);
+        const int own = ::getpriority(PRIO_PROCESS, 0);
+        EXPECT_EQ(std::stoi(fields[19]), background ? std::max(own, 10) : own) << "nice";
+        EXPECT_EQ(std::stoi(fields[41]), background ? SCHED_IDLE : SCHED_OTHER) << "policy";
+        child.Kill(65535);
+        child.WaitForExit();
+    }
 }
 
 TEST_F(ChildProcessTest, KillReportsTheGivenCodeAndEndsTheWholeGroup) {

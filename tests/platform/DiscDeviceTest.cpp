@@ -178,6 +178,27 @@ TEST(DiscDeviceTest, BrokenImagesAreNoDisc) {
 }
 
 // A .bin cut inside the last track is still a disc, one whose last track is shorter.
+// CD-Text of a cue sheet (TITLE and PERFORMER) comes with the table, and a disc without any
+// has none.
+TEST(DiscDeviceTest, CdTextOfACueSheetComesWithTheTable) {
+    test::TempDir dir;
+    test::ImageOptions options;
+    options.cdTextAlbum = "Harbour Lights";
+    options.cdTextArtist = "The Night Train Trio";
+    const test::DiscImage image = test::WriteDiscImage(dir.Path(), "texts", test::ThreeTrackSpecs(150), options);
+    const auto device = MakeDiscDevice();
+    DiscTable table;
+    ASSERT_TRUE(device->ReadToc(image.cuePath, table));
+    EXPECT_EQ(table.cdTextAlbum, "Harbour Lights");
+    EXPECT_EQ(table.cdTextArtist, "The Night Train Trio");
+    EXPECT_EQ(table.cdTextTitles, (std::vector<std::string>{"Song 1", "Song 2", "Song 3"}));
+    EXPECT_TRUE(table.HasCdText());
+
+    const test::DiscImage plain = test::WriteDiscImage(dir.Path(), "plain", test::ThreeTrackSpecs(150));
+    ASSERT_TRUE(device->ReadToc(plain.cuePath, table));
+    EXPECT_FALSE(table.HasCdText());
+}
+
 TEST(DiscDeviceTest, BinCutInsideTheLastTrackShortensIt) {
     test::TempDir dir;
     const DiscImage image = test::WriteDiscImage(dir.Path(), "cut", test::ThreeTrackSpecs());

@@ -101,8 +101,9 @@ protected:
         // "ABE": 01-Artist-Title, so a file named so proves the scheme setting was read.
         SetString("allscheme", "E,AE,AEB,ABE,AHE,AEH");
         SetInt("scheme", 3);
-        image = test::WriteDiscImage(dir.Path(), "disc", test::ThreeTrackSpecs(),
-                                     test::ImageOptions{.writeToc = true});
+        test::ImageOptions withToc;
+        withToc.writeToc = true;
+        image = test::WriteDiscImage(dir.Path(), "disc", test::ThreeTrackSpecs(), withToc);
         std::ofstream(dir / "records/0e001003.cddb")
             << "[CDINFO]\r\nARITIST=The Testers\r\nALBUM=Test Album\r\nGENRE=rock\r\nYEAR=2004\r\n"
                "[MUSIC]\r\nTotal=3\r\nTrack00=First Light\r\nTrack01=Second\r\nTrack02=Third\r\n";
@@ -202,6 +203,16 @@ TEST_F(AcripTest, CddbLooksTheDiscUpTakesTheChosenMatchAndNamesItOfflineLater) {
         EXPECT_TRUE(Contains(found.out, "  2  00:09  Two / Too\n")) << found.out;
         ASSERT_EQ(server.Requests().size(), 2u);
         EXPECT_TRUE(Contains(server.Requests()[1], "cmd=cddb+read+misc+14001403&hello="));
+
+        // An entry the server sends without the comments every xmcd entry carries is no
+        // record: exit 1 and the reason, not only "did not name".
+        test::CddbTestServer broken;
+        broken.AddRecord("rock", 0x14001403, "Band / Album",
+                         "DISCID=14001403\r\nDTITLE=Band / Album\r\nTTITLE0=One\r\n");
+        const test::ToolResult bare = Acrip({"--device", gapped.cuePath, "--cddb", "--server",
+                                             "127.0.0.1:" + std::to_string(broken.Port())});
+        EXPECT_EQ(bare.exitCode, 1);
+        EXPECT_TRUE(Contains(bare.err, "acrip: The disc entry")) << bare.err;
 
         // A match number past the list takes the first, and says so.
         const test::ToolResult past =

@@ -17,8 +17,17 @@ namespace {
 
 using platform::DiscTable;
 
+DiscTable Table(int first, int last, std::vector<platform::TocTrack> tracks, int leadOut) {
+    DiscTable table;
+    table.firstTrack = first;
+    table.lastTrack = last;
+    table.tracks = std::move(tracks);
+    table.leadOutLba = leadOut;
+    return table;
+}
+
 DiscTable ThreeTracks() {
-    return DiscTable{1, 3, {{1, false, 150}, {2, false, 9000}, {3, false, 20000}}, 30000};
+    return Table(1, 3, {{1, false, 150}, {2, false, 9000}, {3, false, 20000}}, 30000);
 }
 
 class FakeDiscDevice final : public platform::IDiscDevice {
@@ -130,7 +139,7 @@ TEST(DriveWatcherTest, DiscInTheSecondDriveOnlyIsFoundThoughTheFirstIsSelected) 
 TEST(DriveWatcherTest, SingleTrackDiscsAndNoDrivesStartNothing) {
     Panel panel;
     panel.drives = {"/dev/sr0"};
-    panel.device.discs["/dev/sr0"] = DiscTable{1, 1, {{1, false, 150}}, 30000};
+    panel.device.discs["/dev/sr0"] = Table(1, 1, {{1, false, 150}}, 30000);
     EXPECT_FALSE(panel.Tick().startLoadTimer);
     EXPECT_FALSE(panel.watcher.DiscSeen());
 

@@ -124,5 +124,32 @@ TEST(TrackTableTest, RowsOfADiscWithADataTrackAtTheEnd) {
     EXPECT_EQ(DefaultTrackName(10), "Track10");
 }
 
+// A disc's CD-Text names it when no local record does, in the order cddborder gives; a data
+// track gets no title, as it gets no row.
+TEST(TrackTableTest, CdTextBecomesARecordOfTheAudioTracks) {
+    test::TempDir dir;
+    std::vector<test::TrackSpec> specs = test::ThreeTrackSpecs(150);
+    test::TrackSpec data;
+    data.data = true;
+    data.dataSectors = 300;
+    specs.push_back(data);
+    test::ImageOptions options;
+    options.cdTextAlbum = "Album";
+    options.cdTextArtist = "Artist";
+    const DiscTable table = ReadImage(test::WriteDiscImage(dir.Path(), "t", specs, options).cuePath);
+    cddb::CDDiscInfo record;
+    ASSERT_TRUE(RecordFromCdText(table, record));
+    EXPECT_EQ(record.artist, "Artist");
+    EXPECT_EQ(record.album, "Album");
+    EXPECT_EQ(record.trackCount, 3);
+    EXPECT_EQ(record.Title(2), "Song 3");
+    EXPECT_FALSE(RecordFromCdText(ReadImage(test::WriteDiscImage(dir.Path(), "u", specs).cuePath), record));
+    EXPECT_FALSE(CdTextBeforeLocalRecord(0));
+    EXPECT_FALSE(CdTextBeforeLocalRecord(1));
+    EXPECT_FALSE(CdTextBeforeLocalRecord(2));
+    EXPECT_TRUE(CdTextBeforeLocalRecord(3)) << "Remote, then CD-Text, then Local";
+    EXPECT_TRUE(CdTextBeforeLocalRecord(4));
+}
+
 }  // namespace
 }  // namespace ac

@@ -108,6 +108,28 @@ TEST_F(MainWindowTest, AbsurdRememberedRectanglesComeBackOnScreen) {
     EXPECT_EQ(program.WaitShown().at("rect"), "220,195,840,634");
 }
 
+// Files named on the command line join the convert list; a later start hands its files to the
+// running copy and ends, so one window holds them all.
+TEST_F(MainWindowTest, FilesOfTheCommandLineAndOfALaterStartJoinOneList) {
+    ac::test::TempDir media;
+    for (const char* name : {"a.wav", "b.wav", "c.wav", "d.wav", "e.wav"}) {
+        const ac::test::ToolResult made = ac::test::RunTool(
+            "/usr/bin/ffmpeg", {"-v", "error", "-f", "lavfi", "-i", "sine=duration=1", media / name});
+        ASSERT_EQ(made.exitCode, 0) << made.err;
+    }
+    Program first(m_home, AC_BIN_DIR "/audio-converter",
+                  {media / "a.wav", media / "b.wav", media / "c.wav"});
+    State state = first.WaitFor([](const State& s) { return s.count("row2") > 0; });
+    ASSERT_EQ(state.count("row2"), 1u) << "three files of the command line";
+    Program second(m_home, AC_BIN_DIR "/audio-converter",
+                   {media / "d.wav", media / "e.wav", "--no-such-switch"});
+    EXPECT_TRUE(second.WaitForExit(15s)) << "the second start hands over and ends";
+    state = first.WaitFor([](const State& s) { return s.count("row4") > 0; });
+    EXPECT_EQ(state.count("row4"), 1u) << "five rows in the first window";
+    EXPECT_EQ(state.count("row5"), 0u) << "the refused switch is no row";
+    EXPECT_NE(state.at("row4").find("e.wav"), std::string::npos);
+}
+
 TEST_F(MainWindowTest, ASecondStartEndsSilentlyWhileTheFirstRunsOn) {
     Program first(m_home);
     ASSERT_FALSE(first.WaitShown().empty());

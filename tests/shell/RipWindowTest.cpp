@@ -175,4 +175,19 @@ TEST_F(RipWindowTest, WhatIsTypedRightAfterAddingAnImageStays) {
     EXPECT_EQ(Field(state, "ripboxes").rfind("Harbour Band|", 0), 0u) << Field(state, "ripboxes");
 }
 
+// A disc that carries CD-Text and has no local record is named from its CD-Text.
+TEST_F(RipWindowTest, CdTextNamesADiscWithoutARecord) {
+    ac::test::ImageOptions options;
+    options.cdTextAlbum = "Lights at Night";
+    options.cdTextArtist = "Harbour Band";
+    const ac::test::DiscImage texts =
+        ac::test::WriteDiscImage(home / "images", "texts", ac::test::ThreeTrackSpecs(150), options);
+    ac::test::WriteSettings(home, "last_run_function=dword:1\ncdimages=sz:" + texts.cuePath +
+                                      "\nlocalcddb=sz:" + (home / "cddb") + "\n");
+    Program program(home);
+    const State state = program.WaitFor([](const State& s) { return RowField(s, 2, 0) == "Song 3"; });
+    EXPECT_EQ(RowField(state, 0, 0), "Song 1");
+    EXPECT_EQ(Field(state, "ripboxes").rfind("Harbour Band|Lights at Night|", 0), 0u) << Field(state, "ripboxes");
+}
+
 }  // namespace

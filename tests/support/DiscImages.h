@@ -64,6 +64,9 @@ struct ImageOptions {
     bool writeToc = false;
     TocGaps tocGaps = TocGaps::Pregap;
     bool absoluteTocPaths = false;  // else the FILE names are relative to the .toc's folder
+    // CD-Text in the cue sheet: the disc's TITLE and PERFORMER, and "Song N" for track N.
+    std::string cdTextAlbum;
+    std::string cdTextArtist;
 };
 
 // What a rip of an audio track reads: its PCM and then zeros to the end of its last sector.
@@ -124,7 +127,11 @@ inline DiscImage WriteDiscImage(const std::string& folder, const std::string& na
     image.binPath = folder + "/" + name + ".bin";
     image.cuePath = folder + "/" + name + ".cue";
     std::string bin;
-    std::string cue = "FILE \"" + name + ".bin\" BINARY\n";
+    std::string cue;
+    if (!options.cdTextAlbum.empty()) {
+        cue += "PERFORMER \"" + options.cdTextArtist + "\"\nTITLE \"" + options.cdTextAlbum + "\"\n";
+    }
+    cue += "FILE \"" + name + ".bin\" BINARY\n";
     bool anyData = false;
     int lsn = 0;
     for (size_t i = 0; i < specs.size(); ++i) {
@@ -137,6 +144,9 @@ inline DiscImage WriteDiscImage(const std::string& folder, const std::string& na
         std::snprintf(head, sizeof head, "  TRACK %02d %s\n", track.number,
                       spec.data ? "MODE1/2352" : "AUDIO");
         cue += head;
+        if (!options.cdTextAlbum.empty() && !spec.data) {
+            cue += "    TITLE \"Song " + std::to_string(track.number) + "\"\n";
+        }
         if (spec.gapSectors > 0) {
             track.gapLsn = lsn;
             cue += "    INDEX 00 " + MsfText(lsn) + "\n";

@@ -17,6 +17,7 @@
 #include <map>
 #include <sstream>
 #include <string>
+#include <vector>
 #include <thread>
 
 namespace ac::test {
@@ -26,7 +27,8 @@ using State = std::map<std::string, std::string>;
 
 class Program {
 public:
-    Program(const TempDir& home, std::string executable = AC_BIN_DIR "/audio-converter")
+    Program(const TempDir& home, std::string executable = AC_BIN_DIR "/audio-converter",
+            std::vector<std::string> args = {})
         : m_home(home.Path()), m_hook(home / "hook") {
         std::filesystem::create_directories(m_hook);
         std::filesystem::remove(m_hook + "/state.txt");
@@ -38,7 +40,12 @@ public:
             ::setenv("AUDIOCONV_TEST_DIR", m_hook.c_str(), 1);
             ::setenv("AUDIOCONV_POWER_DRYRUN", (m_home + "/power.txt").c_str(), 1);
             ::setenv("LANG", "C", 1);
-            ::execl(executable.c_str(), executable.c_str(), static_cast<char*>(nullptr));
+            // The socket that takes a later start's files lives here, apart from other tests'.
+            ::setenv("XDG_RUNTIME_DIR", m_home.c_str(), 1);
+            std::vector<char*> argv{executable.data()};
+            for (std::string& arg : args) argv.push_back(arg.data());
+            argv.push_back(nullptr);
+            ::execv(executable.c_str(), argv.data());
             ::_exit(127);
         }
     }

@@ -199,6 +199,9 @@ int main(int argc, char** argv) {
     }
     driverConfig.toolPath = platform::FindConversionTool();
     driverConfig.toolDirectory = base;
+    // The same background priority as the window's runs: the settings file says it for both.
+    driverConfig.slowdown = config.GetInt("slowdown") != 0;
+    driverConfig.idle = config.GetInt("idle") != 0;
     // The end-of-run sound and after-run action belong to the window; a terminal run has none.
     driverConfig.afterConvertAction = 4;
     NamingSettings naming = ReadNamingSettings(config);

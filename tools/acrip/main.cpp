@@ -310,6 +310,9 @@ public:
         }
         return std::max(m_choose, 1) - 1;
     }
+    void ShowEntryProblem(const std::string& reason) override {
+        std::fprintf(stderr, "acrip: %s\n", reason.c_str());
+    }
 
 private:
     int m_choose;
@@ -431,6 +434,9 @@ int main(int argc, char** argv) {
     if (!PrepareOutputFolder(options, config, settings.outputDirectory))
         return kUsageError;
     settings.ejectCd = config.GetInt("ejectcd") != 0;
+    // The same background priority as the window's runs: the settings file says it for both.
+    settings.slowdown = config.GetInt("slowdown") != 0;
+    settings.idle = config.GetInt("idle") != 0;
     settings.naming = ReadNamingSettings(config);
     settings.toolPath = platform::FindConversionTool();
     settings.toolDirectory = base;

@@ -142,7 +142,11 @@ void CDRipDlg::FillList(int driveIndex, const platform::DiscTable& table) {
     const std::string& drive = m_drives[std::size_t(driveIndex)];
     m_discId = DiscIdOf(table);
     cddb::CDDiscInfo record;
-    const bool haveRecord = cddb::LoadDiscFile(m_cddbFolder, m_discId, record);
+    // Names from the local record and the disc's CD-Text, in the order the settings give.
+    const bool textFirst = CdTextBeforeLocalRecord(GetAppConfig().GetInt("cddborder"));
+    bool haveRecord = textFirst && RecordFromCdText(table, record);
+    if (!haveRecord) haveRecord = cddb::LoadDiscFile(m_cddbFolder, m_discId, record);
+    if (!haveRecord && !textFirst) haveRecord = RecordFromCdText(table, record);
     const std::vector<TrackRow> tracks = BuildTrackRows(table, drive, haveRecord ? &record : nullptr);
 
     const Profile* profile = m_modeHost != nullptr ? m_modeHost->CurrentProfile() : nullptr;
@@ -463,6 +467,8 @@ void CDRipDlg::RefreshDriverSettings() {
     RipSettings settings;
     settings.outputDirectory = config.GetString("OutputCDDir");
     settings.ejectCd = config.GetInt("ejectcd") != 0;
+    settings.slowdown = config.GetInt("slowdown") != 0;
+    settings.idle = config.GetInt("idle") != 0;
     settings.naming = ReadNamingSettings(config);
     settings.toolPath = platform::FindConversionTool();
     settings.toolDirectory = wxFileName(wxString::FromUTF8(settings.toolPath)).GetPath().utf8_string();

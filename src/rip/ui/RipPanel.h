@@ -94,6 +94,9 @@ public:
 
 class CDRipDlg : public ImSkinPanel, public IRipList, public IRipHost {
 public:
+    // The settings the panel keeps a copy of (the local record folder), read again after the
+    // preferences changed them.
+    void ReadSettings();
     // `device` is the drives' interface: the real one in the program, a fake in tests.
     CDRipDlg(wxWindow* parent, std::unique_ptr<platform::IDiscDevice> device);
     ~CDRipDlg() override;
@@ -200,7 +203,6 @@ private:
 
     void CreateControls();
     void BindEvents();
-    void ReadSettings();
     void FillList(int driveIndex, const platform::DiscTable& table);
     void ClearDisc();
     void SetCurrentDrive(int driveIndex);
