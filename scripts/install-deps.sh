@@ -12,6 +12,7 @@ packages=(
   libcdio-dev libcdio-paranoia-dev libburn-dev libisofs-dev libsdl2-dev libuchardet-dev
   # tests and benchmarks
   googletest libgtest-dev libbenchmark-dev xvfb xauth x11-utils imagemagick ffmpeg hyperfine time
+  xorriso
   # man pages, and the checks of the desktop files and the package
   scdoc desktop-file-utils appstream lintian bash-completion
 )

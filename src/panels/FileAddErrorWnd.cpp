@@ -16,6 +16,7 @@ namespace {
 
 constexpr std::uint32_t kUnreadable = 439;
 constexpr std::uint32_t kAlreadyAdded = 440;
+constexpr std::uint32_t kNameTooLong = 0xC042;
 constexpr std::uint32_t kTitle = 442;
 constexpr std::uint32_t kFileName = 443;
 constexpr std::uint32_t kFilePath = 444;
@@ -64,7 +65,9 @@ void CFileAddErrorWnd::AddRefusedFile(const std::string& path, Reason reason) {
     if (!m_richEdit->IsEmpty()) {
         AppendRun(*m_richEdit, "\r\n", plain);
     }
-    const std::uint32_t reasonId = reason == Reason::AlreadyAdded ? kAlreadyAdded : kUnreadable;
+    const std::uint32_t reasonId = reason == Reason::AlreadyAdded  ? kAlreadyAdded
+                                   : reason == Reason::NameTooLong ? kNameTooLong
+                                                                   : kUnreadable;
     AppendRun(*m_richEdit, g_Language.GetString(reasonId) + "\r\n", bold);
     AppendRun(*m_richEdit, g_Language.GetString(kFileName), plain);
     AppendRun(*m_richEdit, RefusedFileTitle(path) + "\r\n", red);

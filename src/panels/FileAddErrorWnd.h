@@ -21,7 +21,7 @@ public:
     static constexpr int kClearId = 1004;
     static constexpr int kCloseId = 1186;
 
-    enum class Reason { AlreadyAdded, Unreadable };
+    enum class Reason { AlreadyAdded, Unreadable, NameTooLong };
 
     CFileAddErrorWnd();
 

@@ -29,6 +29,7 @@ constexpr std::array kKeys = {
     S("OutputCDDir", "", "output folder of ripping; default the music folder"),
     S("burntemp", "", "folder for the temporary WAV files of a burn"),
     I("burncopies", 1, "copies to burn"),
+    S("burnimage", "", "path without extension of the disc image recorder's files; empty: ~/Music/disc"),
     I("scheme", 1, "index into allscheme"),
     S("allscheme", "E,AE,AEB,ABE,AHE,AEH", "naming patterns"),
     I("illegal", 0, "0 drops characters illegal in names; else replaces them"),

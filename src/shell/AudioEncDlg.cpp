@@ -1,6 +1,7 @@
 #include "shell/Preferences.h"
 #include "shell/AudioEncDlg.h"
 
+#include "burn/ui/CDCreatorPanel.h"
 #include "cddb/ui/CddbWaitDlg.h"
 
 #include "medialist/ui/MediaListWnd.h"
@@ -16,6 +17,7 @@
 #include "profile/ui/SideBarWnd.h"
 #include "resources/Language.h"
 #include "shell/AppConfig.h"
+#include "shell/BurnMode.h"
 #include "shell/Check.h"
 #include "shell/ConvertMode.h"
 #include "shell/MenuTables.h"
@@ -110,6 +112,9 @@ CAudioEncDlg::~CAudioEncDlg() {
     if (g_RipDlg != nullptr) {
         g_RipDlg->SetModeHost(nullptr);
     }
+    if (g_CreatorPanel != nullptr) {
+        g_CreatorPanel->SetModeHost(nullptr);
+    }
     if (GetMainHub() == this) {
         SetMainHub(nullptr);
     }
@@ -148,6 +153,7 @@ void CAudioEncDlg::OnInitDialog() {
         mode = 0;
     }
     m_rip = std::make_unique<CRipMode>(this, *g_RipDlg);
+    m_burn = std::make_unique<CBurnMode>(this, *g_CreatorPanel);
     LoadModeMenu(mode);
     m_convert = std::make_unique<CConvertMode>(this);
     m_convert->SetWorkMode(mode);
@@ -164,7 +170,7 @@ void CAudioEncDlg::CreatePanels() {
     // Order of creation is the order of skin notices.
     m_check = new CCheck(this);
     m_panels[Status] = new CStatusWnd(this);
-    m_panels[Creator] = new ImSkinPanel(this, 1001, "CDCreatorPanel");
+    m_panels[Creator] = new CCDCreatorPanel(this);
     m_panels[SideBar] = new CSideBarWnd(this);
     m_panels[MediaList] = new CMediaListWnd(this);
     m_panels[Output] = new COutputPanelWnd(this);
@@ -173,15 +179,6 @@ void CAudioEncDlg::CreatePanels() {
     player->SetModeList(1, &RipPreviewList());
     m_panels[Player] = player;
     m_panels[Rip] = new CDRipDlg(this, platform::MakeDiscDevice());
-    // The context menu of the list still to come; the media and rip lists open their own.
-    const std::pair<Panel, int> contextMenus[] = {{Creator, kBurnListContextMenu}};
-    for (const auto& [panel, menuId] : contextMenus) {
-        m_panels[panel]->Bind(wxEVT_CONTEXT_MENU, [this, menuId = menuId](wxContextMenuEvent&) {
-            std::unique_ptr<wxMenu> menu = BuildContextMenu(menuId);
-            TranslatePopupMenu(*menu, menuId);
-            PopupMenu(menu.get());
-        });
-    }
     m_panels[Player]->SetSize(-1, kPlayerHeight);
     new CFileInfoWnd(this);  // hidden until Show File Information; goes with this window
 }
@@ -430,7 +427,7 @@ void CAudioEncDlg::FromTray() {
 bool CAudioEncDlg::RunStopLogic() {
     // A rip keeps running in the background of another tab, so its question comes in any mode.
     m_bCloseAccepted = (GetWorkMode() != 0 || !m_convert || m_convert->StopForClose()) &&
-                       (!m_rip || m_rip->StopForClose());
+                       (!m_rip || m_rip->StopForClose()) && (!m_burn || m_burn->StopForClose());
     return m_bCloseAccepted;
 }
 
@@ -487,6 +484,9 @@ void CAudioEncDlg::OnCommand(wxCommandEvent& event) {
         if (m_rip) {
             m_rip->SetAfterRunAction(m_afterConvert);
         }
+        if (m_burn) {
+            m_burn->SetAfterRunAction(m_afterConvert);
+        }
         return;
     }
     // Show File Information serves every mode: the window shows whatever row it was given.
@@ -498,6 +498,10 @@ void CAudioEncDlg::OnCommand(wxCommandEvent& event) {
     }
     if (m_rip && GetWorkMode() == 1 && m_rip->IsOwnCommand(id)) {
         m_rip->OnCommand(id);
+        return;
+    }
+    if (m_burn && GetWorkMode() == 2 && m_burn->IsOwnCommand(id)) {
+        m_burn->OnCommand(id);
         return;
     }
     // Commands of another mode do nothing when they arrive anyway.

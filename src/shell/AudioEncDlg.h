@@ -21,6 +21,7 @@ class wxTaskBarIcon;
 namespace ac {
 
 class CCheck;
+class CBurnMode;
 class CConvertMode;
 class CRipMode;
 class ImMenuBar;
@@ -110,6 +111,7 @@ private:
     std::unique_ptr<wxTaskBarIcon> m_tray;
     std::unique_ptr<CConvertMode> m_convert;
     std::unique_ptr<CRipMode> m_rip;
+    std::unique_ptr<CBurnMode> m_burn;
     bool m_gridEditable = true;
     bool m_bInTray = false;
     bool m_bCloseAccepted = true;

@@ -9,6 +9,7 @@
 #include "profile/ui/SideBarWnd.h"
 #include "shell/AppConfig.h"
 #include "shell/AudioEncDlg.h"
+#include "shell/BurnMode.h"
 #include "shell/Check.h"
 #include "shell/ConvertMode.h"
 #include "shell/MenuTables.h"
@@ -37,6 +38,9 @@ bool CAudioEncDlg::IsCommandEnabled(int commandId) {
     }
     if (GetWorkMode() == 0 && m_convert && m_convert->IsOwnCommand(commandId)) {
         return m_convert->IsCommandEnabled(commandId);
+    }
+    if (GetWorkMode() == 2 && m_burn && m_burn->IsOwnCommand(commandId)) {
+        return m_burn->IsCommandEnabled(commandId);
     }
     return true;
 }
@@ -191,6 +195,10 @@ void CAudioEncDlg::ApplyProfile(Profile& profile) {
         if (g_RipDlg != nullptr && g_SideBar != nullptr) {
             g_RipDlg->ApplyProfile(profile, g_SideBar->GetSelectedIndex());
         }
+    } else if (GetWorkMode() == 2) {
+        if (g_CreatorPanel != nullptr) {
+            g_CreatorPanel->ApplyProfile(profile);
+        }
     } else if (g_MediaList != nullptr) {
         g_MediaList->ApplyProfile(profile);
     }
@@ -260,6 +268,9 @@ std::vector<ParameterSet*> CAudioEncDlg::SelectedSets() {
     }
     if (GetWorkMode() == 1 && g_RipDlg != nullptr) {
         return g_RipDlg->SelectedSets();
+    }
+    if (GetWorkMode() == 2 && g_CreatorPanel != nullptr) {
+        return g_CreatorPanel->SelectedSets();
     }
     return {};
 }

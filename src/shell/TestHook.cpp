@@ -1,6 +1,8 @@
 #include "shell/Preferences.h"
 #include "shell/TestHook.h"
 
+#include "burn/ui/CDCreatorPanel.h"
+#include "burn/ui/DiscDialogs.h"
 #include "cddb/ui/CddbSelectDlg.h"
 #include "cddb/ui/CddbWaitDlg.h"
 #include "rip/ui/RipPanel.h"
@@ -10,6 +12,7 @@
 #include "convert/RowParameters.h"
 #include "medialist/ui/MediaListWnd.h"
 #include "medialist/ui/OutputPanelWnd.h"
+#include "panels/FileAddErrorWnd.h"
 #include "panels/FileInfoWnd.h"
 #include "panels/PlayerWnd.h"
 #include "panels/StatusWnd.h"
@@ -195,6 +198,35 @@ void CTestHook::DescribePanels(const CAudioEncDlg& dlg, std::ostream& out) {
         out << "ripdiscid=" << std::hex << g_RipDlg->DiscId() << std::dec << "\n";
         out << "cddblookup=" << (g_RipDlg->IsLookupOpen() ? 1 : 0) << "\n";
     }
+    if (g_CreatorPanel != nullptr) {
+        // Tab-separated: number, name, duration, type, status, selected, source.
+        std::istringstream rows(g_CreatorPanel->DescribeRows());
+        std::string row;
+        for (int index = 0; std::getline(rows, row); ++index) out << "burnrow" << index << "=" << row << "\n";
+        out << "burntally=" << g_CreatorPanel->Tally().minutes << ":" << g_CreatorPanel->Tally().seconds << "\n";
+        out << "burnactive=" << (g_CreatorPanel->Driver().BurnActive() ? 1 : 0) << "\n";
+        out << "burnrecorders=" << g_CreatorPanel->Recorders().size() << "\n";
+        // Add, Remove, Clear, Burn, Stop, Move up, Move down: 1 where the command is enabled.
+        out << "burnenabled=";
+        for (int id : {burncmd::kAdd, burncmd::kRemove, burncmd::kClear, burncmd::kBurn, burncmd::kStop,
+                       burncmd::kMoveUp, burncmd::kMoveDown})
+            out << (g_CreatorPanel->IsCommandEnabled(id) ? 1 : 0);
+        out << "\n";
+        if (CFileAddErrorWnd* refused = g_CreatorPanel->RefusedWindow()) {
+            std::string text = refused->RichEdit()->GetValue().utf8_string();
+            std::replace(text.begin(), text.end(), '\n', '|');
+            std::erase(text, '\r');
+            out << "refused=" << text << "\n";
+        }
+    }
+    if (CWaitingDiscDlg* waiting = CWaitingDiscDlg::Shown()) {
+        std::string text = waiting->Describe();
+        std::replace(text.begin(), text.end(), '\n', ' ');
+        out << "waitingdisc=" << text << "\n";
+    }
+    if (CEraseRewritableDiscDlg* erase = CEraseRewritableDiscDlg::Shown()) {
+        out << "erasedisc=" << erase->Describe() << "\n";
+    }
     if (CCddbWaitDlg* lookup = CCddbWaitDlg::Shown()) {
         out << lookup->Describe();
     }
@@ -330,6 +362,20 @@ void CTestHook::RunScriptCommand(CAudioEncDlg& dlg, const std::string& line) {
         int index = 0;
         in >> index;
         g_SideBar->SelectIndex(index, true);
+    } else if (verb == "burnadd" && g_CreatorPanel != nullptr) {
+        g_CreatorPanel->AddFile(rest, -1);
+    } else if (verb == "burnselect" && g_CreatorPanel != nullptr) {
+        std::vector<int> rows;
+        for (int row; in >> row;) rows.push_back(row);
+        g_CreatorPanel->SelectRows(rows);
+    } else if (verb == "disctype" && g_SideBar != nullptr) {
+        int type = 0;
+        in >> type;
+        g_SideBar->SelectDiscType(type);
+    } else if (verb == "waitcheck" && CWaitingDiscDlg::Shown() != nullptr) {
+        CWaitingDiscDlg::Shown()->CheckNow();
+    } else if (verb == "erase" && CEraseRewritableDiscDlg::Shown() != nullptr) {
+        CEraseRewritableDiscDlg::Shown()->PressErase(rest == "full");
     } else if (verb == "ripimage" && g_RipDlg != nullptr) {
         g_RipDlg->AddDiscImagePath(rest);
     } else if (verb == "ripbox" && g_RipDlg != nullptr) {

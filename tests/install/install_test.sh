@@ -15,13 +15,14 @@ mkdir -p "$HOME"
 fail() { echo "install test: $*" >&2; exit 1; }
 
 cmake --install "$build" --prefix "$prefix" > "$work/install.log" || fail "cmake --install failed"
-for path in bin/audio-converter bin/acconvert bin/acrip bin/acprobe lib/audio-converter/ctt \
+for path in bin/audio-converter bin/acconvert bin/acrip bin/acburn bin/acprobe lib/audio-converter/ctt \
             share/audio-converter/data.pkg share/audio-converter/help/Default.htm \
             share/audio-converter/wav/hint1.wav share/applications/io.velmorant.AudioConverter.desktop \
             share/metainfo/io.velmorant.AudioConverter.metainfo.xml \
             share/icons/hicolor/48x48/apps/io.velmorant.AudioConverter.png \
             share/icons/hicolor/scalable/apps/io.velmorant.AudioConverter.svg \
-            share/man/man1/acconvert.1.gz share/bash-completion/completions/acconvert; do
+            share/man/man1/acconvert.1.gz share/bash-completion/completions/acconvert \
+            share/man/man1/acburn.1.gz share/bash-completion/completions/acburn; do
   [ -e "$prefix/$path" ] || fail "not installed: $path"
 done
 
@@ -33,9 +34,10 @@ ffmpeg -nostdin -loglevel error -f lavfi -i "sine=duration=2" "$work/tone.wav"
 ffprobe -v error -show_entries stream=codec_name -of csv=p=0 "$work/out/tone.ogg" | grep -qx vorbis \
   || fail "tone.ogg is not Vorbis"
 "$prefix/bin/acrip" --help | grep -q -- "--device" || fail "installed acrip has no help"
+"$prefix/bin/acburn" --help | grep -q -- "--image" || fail "installed acburn has no help"
 
 # Man pages read as man pages.
-for page in audio-converter acconvert acrip acprobe ctt; do
+for page in audio-converter acconvert acrip acburn acprobe ctt; do
   MANWIDTH=80 man -l "$prefix/share/man/man1/$page.1.gz" 2>/dev/null | grep -q "^NAME" \
     || fail "man page of $page does not read"
 done

@@ -112,9 +112,9 @@ TEST(ConfigKeyTableTest, NamesAreUniqueAndServerEntriesResolve) {
     for (const ConfigKey& key : ConfigKeys()) {
         EXPECT_TRUE(names.insert(key.name).second) << key.name;
     }
-    // The forty of the settings key, the disc images, and the CDDB identity (cddb_email and
-    // cddb_proto).
-    EXPECT_EQ(names.size(), 43u);
+    // The forty of the settings key, the disc images, the CDDB identity (cddb_email and
+    // cddb_proto) and the disc image recorder's files (burnimage).
+    EXPECT_EQ(names.size(), 44u);
     ASSERT_NE(FindConfigKey("addr12"), nullptr);
     EXPECT_STREQ(FindConfigKey("addr12")->name, "addr");
     EXPECT_EQ(FindConfigKey("addrx"), nullptr);
