@@ -188,4 +188,34 @@ TEST_F(PreferencesWindowTest, FileRipAndBurnPagesAndANewSchemeNamesTheNextOutput
     EXPECT_TRUE(named) << "the scheme's index and file name lead the output's name: " << names;
 }
 
+// The CDDB page: the default server when none is kept, a time-out that is no number refused,
+// the hello's e-mail and protocol level and the order written on Apply.
+TEST_F(PreferencesWindowTest, CddbPageWritesTheServerTimeOutHelloAndOrder) {
+    Program program(m_home);
+    program.WaitShown();
+    State state = Open(program);
+    EXPECT_EQ(Control(state, 2, 1114), "gnudb.gnudb.org & 80") << "addrcount 0: the default";
+    EXPECT_EQ(Control(state, 2, 1178), "Local CDDB->Remote CDDB->CD-Text");
+    EXPECT_EQ(Control(state, 2, 1108), "Choose|1") << "no WinampDB path yet";
+    program.Send("prefset 2 1117 soon");
+    program.Send("prefapply");
+    state = program.WaitFor([](const State& s) { return Has(Field(s, "boxes"), "whole number"); });
+    EXPECT_EQ(Field(state, "prefpage"), "2");
+    program.Send("prefset 2 1117 45");
+    program.Send("prefset 2 1231 me@example.org");
+    program.Send("prefset 2 1233 2");
+    program.Send("prefset 2 1178 4");
+    program.Send("prefset 2 1111 1");
+    program.Send("prefapply");
+    state = program.WaitFor([](const State& s) { return Field(s, "prefapply") == "0"; });
+    const std::string settings = program.Settings();
+    EXPECT_TRUE(Has(settings, "timeout=dword:45")) << settings;
+    EXPECT_TRUE(Has(settings, "remotecddb=sz:gnudb.gnudb.org & 80"));
+    EXPECT_TRUE(Has(settings, "cddb_email=sz:me@example.org"));
+    EXPECT_TRUE(Has(settings, "cddb_proto=dword:6"));
+    EXPECT_TRUE(Has(settings, "cddborder=dword:4"));
+    EXPECT_TRUE(Has(settings, "format=dword:1"));
+    Close(program, "ok");
+}
+
 }  // namespace
