@@ -142,8 +142,11 @@ std::string CStatusWnd::DescribeState() const {
         log = RichEditText(*control);
     }
     std::replace(log.begin(), log.end(), '\n', '|');
+    const CapacityBarState bar = m_bar->State();
     return "statustext=" + m_bar->Text().utf8_string() +
-           "\nprogress=" + std::to_string(m_bar->Position()) + "\nlog=" + log + "\n";
+           "\nprogress=" + std::to_string(m_bar->Position()) +
+           "\ngauge=" + std::to_string(bar.nearMark) + "|" + std::to_string(bar.overMark) + "|" +
+           std::to_string(bar.maxMark) + "\nlog=" + log + "\n";
 }
 
 void CStatusWnd::OnStatusTimer() {

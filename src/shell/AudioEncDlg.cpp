@@ -162,6 +162,12 @@ void CAudioEncDlg::OnInitDialog() {
     if (g_SideBar != nullptr) {
         g_SideBar->OnWorkModeChanged(mode);
     }
+    if (g_StatusWnd != nullptr) {
+        g_StatusWnd->OnModeChanged(mode);
+    }
+    if (mode == 2) {
+        m_burn->RefreshGauge();
+    }
     m_diskTimer.Start(3000);
     RecalcLayout();
 }
@@ -215,6 +221,9 @@ void CAudioEncDlg::SwitchMode(int mode) {
                                                                : -1);
     if (g_StatusWnd != nullptr) {
         g_StatusWnd->OnModeChanged(mode);
+    }
+    if (mode == 2 && m_burn) {
+        m_burn->RefreshGauge();
     }
     if (g_SideBar != nullptr && g_SideBar->GetProfileCount() > 0) {
         const int index = m_check->m_profileIndex[static_cast<std::size_t>(mode)];

@@ -80,6 +80,7 @@ public:
     bool IsRipRunActive() override;
     double RipDoneSeconds() override;
     double RipTotalSeconds() override;
+    bool IsBurnRunActive() override;
 
 private:
     std::vector<std::string> m_pendingOpen;  // files to open once the profiles are loaded

@@ -155,7 +155,7 @@ void CAudioEncDlg::UpdateGridEditable() {
     } else if (GetWorkMode() == 1) {
         editable = g_RipDlg != nullptr && g_RipDlg->IsDiscLoaded() && !g_RipDlg->Driver().IsRunning();
     } else {
-        editable = true;  // the burn list brings its own rules with its panel
+        editable = g_CreatorPanel != nullptr && g_CreatorPanel->SelectionEditable();
     }
     if (editable != m_gridEditable) {
         m_gridEditable = editable;
@@ -319,6 +319,8 @@ double CAudioEncDlg::RunTotalSeconds() {
 }
 
 bool CAudioEncDlg::IsRipRunActive() { return m_rip && m_rip->IsRunActive(); }
+
+bool CAudioEncDlg::IsBurnRunActive() { return m_burn && m_burn->IsRunActive(); }
 
 double CAudioEncDlg::RipDoneSeconds() { return m_rip ? m_rip->DoneSeconds() : 0.0; }
 

@@ -9,6 +9,7 @@
 #include "profile/ui/SideBarWnd.h"
 #include "shell/AppConfig.h"
 #include "shell/Check.h"
+#include "shell/MainHub.h"
 #include "shell/MessageBoxes.h"
 
 #include <wx/choice.h>
@@ -173,6 +174,11 @@ int CBurnMode::PauseSeconds() {
 }
 
 CapacityBar* CBurnMode::Gauge() {
+    // The bar is the convert and rip modes' progress bar while they are shown: a list edited
+    // or a disc type chosen behind them must not paint a disc's scale into it.
+    IMainHub* hub = GetMainHub();
+    if (hub == nullptr || hub->WorkMode() != 2)
+        return nullptr;
     return g_StatusWnd != nullptr ? g_StatusWnd->Bar() : nullptr;
 }
 

@@ -20,6 +20,9 @@ public:
     bool OnCommand(int commandId);
     bool IsCommandEnabled(int commandId);
     bool StopForClose() { return m_panel.StopForClose(); }
+    bool IsRunActive() { return m_panel.Driver().BurnActive(); }
+    // The tab has come to the front: the status bar becomes the disc's gauge.
+    void RefreshGauge() { m_panel.RefreshCapacity(); }
     void SetAfterRunAction(int action) { m_afterRunAction = action; }
     void Erase();
 

@@ -84,6 +84,8 @@ public:
     virtual bool IsRipRunActive() { return false; }
     virtual double RipDoneSeconds() { return 0; }
     virtual double RipTotalSeconds() { return 0; }
+    // A burn run is converting or writing: the side bar's sliders hold still under it.
+    virtual bool IsBurnRunActive() { return false; }
 };
 
 // Set by the main dialog when it exists, cleared when it goes; the panels' tests set a fake.

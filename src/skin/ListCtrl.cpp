@@ -1,5 +1,7 @@
 #include "skin/ListCtrl.h"
 
+#include "skin/SkinConfig.h"
+
 #include <wx/dcbuffer.h>
 #include <wx/settings.h>
 
@@ -316,9 +318,18 @@ void XListCtrl::SelectRow(int row, bool only) {
 }
 
 void XListCtrl::RefreshRow(int row) {
-    if (row >= 0 && row < GetItemCount()) {
-        m_body->RefreshRow(static_cast<size_t>(row));
+    if (row < 0 || row >= GetItemCount()) {
+        return;
     }
+    const size_t first = m_body->GetVisibleRowsBegin();
+    if (static_cast<size_t>(row) < first || static_cast<size_t>(row) >= m_body->GetVisibleRowsEnd()) {
+        return;
+    }
+    // The scrolled window's own row refresh spans the client width, which GTK's overlay scroll
+    // bar leaves a few pixels short of what a paint draws: the right edge of a progress frame
+    // stayed on screen under the bar after its row had moved on. Refresh the window's width.
+    const int top = static_cast<int>(static_cast<size_t>(row) - first) * m_rowHeight;
+    m_body->RefreshRect(wxRect(0, top, m_body->GetSize().x, m_rowHeight), false);
 }
 
 void XListCtrl::SetRowHeight(int height) {
@@ -593,7 +604,7 @@ void XListBody::OnLeftDown(wxMouseEvent& event) {
     }
     if (event.ControlDown()) {
         m_list->m_selected[std::size_t(row)] ^= 1;
-        RefreshRow(static_cast<size_t>(row));
+        m_list->RefreshRow(row);
     } else {
         m_list->SelectRow(row);
     }
@@ -636,6 +647,28 @@ void XListBody::OnKey(wxKeyEvent& event) {
             ScrollToRow(static_cast<size_t>(row));
         }
     }
+}
+
+wxColour ApplyListSkin(XListCtrl& list, const ImSkinConfig& skin, const char* section,
+                       const wxColour& background) {
+    list.SetFontOfCells(MakeSkinFont(skin.GetFont(section)));
+    list.SetRowHeight(skin.GetInt("GridHeight", 17, section));
+    const wxColour text = NativeColour(skin.GetRgbColour("TextColor", 0, section));
+    const auto colourOr = [&](const char* key, wxSystemColour fallback) {
+        return skin.GetInt(key, -1, section) == -1
+                   ? wxSystemSettings::GetColour(fallback)
+                   : NativeColour(skin.GetRgbColour(key, 0, section));
+    };
+    list.SetColours(text, background, colourOr("TextColorDisabled", wxSYS_COLOUR_GRAYTEXT),
+                    colourOr("TextColorDown", wxSYS_COLOUR_HIGHLIGHT));
+    if (const int headerColour = skin.GetInt("HeaderBgColor", -1, section); headerColour != -1) {
+        list.Header()->SetSkinColors(NativeColour(static_cast<std::uint32_t>(headerColour)), text);
+    }
+    list.SetHeaderPicture(LoadSkinPicture(skin.GetString("HeaderBack", "", section)),
+                          skin.GetInt("HeaderBgMode", 0, section),
+                          skin.GetInt("HeadBgTopSplitter", 0, section),
+                          skin.GetInt("HeadBgBtmSplitter", 0, section));
+    return text;
 }
 
 }  // namespace ac

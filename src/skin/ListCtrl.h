@@ -44,6 +44,7 @@ struct XListColumn {
 };
 
 class ImHeaderCtrl;
+class ImSkinConfig;
 class XListBody;
 
 class XListCtrl : public wxWindow {
@@ -87,6 +88,7 @@ public:
     const std::vector<XListColumn>& Columns() const { return m_columns; }
     const XListCell* Cell(int row, int column) const;
     XListBody* Body() const { return m_body; }
+    ImHeaderCtrl* Header() const { return m_header; }
     // The scroll range follows inserts and deletes on the next turn of the event loop; callers
     // that scroll at once bring it up to date first.
     void SyncRowCount();
@@ -113,6 +115,12 @@ private:
     wxColour m_progressColour;
     SkinPicture m_emptyPicture;
 };
+
+// Gives a work mode's list the skin's font, row height, colours and header, the same for the
+// three modes; the rows stand on `background`, the panel's own colour, so a dark skin gets a
+// dark list. Answers the cells' text colour.
+wxColour ApplyListSkin(XListCtrl& list, const ImSkinConfig& skin, const char* section,
+                       const wxColour& background);
 
 class ImHeaderCtrl : public wxWindow {
 public:

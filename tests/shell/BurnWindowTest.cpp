@@ -203,6 +203,12 @@ TEST_F(BurnWindowTest, ListRulesMovesRemovalAndRefusedNames) {
         [](const State& s) { return Field(s, "profile").find("WAV") != std::string::npos; });
     // An empty list: only Add.
     EXPECT_EQ(Field(state, "burnenabled"), "1000000");
+    EXPECT_EQ(Field(state, "gauge"), "75|80|90") << "the audio disc's scale from the start";
+    // The convert and rip modes have a plain bar; a disc edited behind them leaves it so.
+    program.Send("tab 0");
+    state = program.WaitFor([](const State& s) { return Field(s, "gauge") == "0|0|0"; });
+    program.Send("tab 2");
+    state = program.WaitFor([](const State& s) { return Field(s, "gauge") == "75|80|90"; });
     state = AddTracks(program);
     // A name of 104 characters is taken, one of 105 refused.
     const std::string longer = home / ("tracks/" + std::string(105, 'n') + ".wav");

@@ -148,6 +148,7 @@ TEST_F(MainWindowTest, SwitchingTabsSwitchesPanelMenuAndTheRememberedMode) {
     EXPECT_EQ(state.at("menu"), "129");
     EXPECT_NE(state.at("visible").find("MediaList;"), std::string::npos);
     EXPECT_EQ(state.at("tabs"), "Convert-|Rip+|Burn+|");
+    EXPECT_EQ(state.at("gauge"), "0|0|0") << "a plain bar: no disc scale in the convert mode";
 
     program.Send("tab 2");
     state = program.WaitFor([](const State& s) { return s.at("mode") == "2"; });

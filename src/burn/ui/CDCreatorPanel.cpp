@@ -322,6 +322,13 @@ void CCDCreatorPanel::Renumber() {
 
 // ---- Commands -------------------------------------------------------------------------------
 
+bool CCDCreatorPanel::SelectionEditable() const {
+    const std::vector<int> rows = SelectedRows();
+    return !rows.empty() && std::none_of(rows.begin(), rows.end(), [this](int row) {
+        return m_rows[std::size_t(row)]->item->Status() == JobStatus::Running;
+    });
+}
+
 std::vector<int> CCDCreatorPanel::SelectedRows() const {
     std::vector<int> rows;
     for (int row = 0; row < m_list->GetItemCount(); ++row)

@@ -116,6 +116,8 @@ public:
     // ---- Profiles ----
     void ApplyProfile(const Profile& profile);
     std::vector<ParameterSet*> SelectedSets();
+    // The side bar's grid edits the selection: some row selected and none of them converting.
+    bool SelectionEditable() const;
 
     // ---- Recorders and the gauge ----
     void ListRecorders();

@@ -330,21 +330,7 @@ bool CCDCreatorPanel::OnSkinChanged(const std::string& skinDir) {
     ImSkinPanel::OnSkinChanged(skinDir);
     const char* section = GetSkinSection();
     const wxFont font = MakeSkinFont(m_skin.GetFont(section));
-    m_list->SetFontOfCells(font);
-    m_list->SetRowHeight(m_skin.GetInt("GridHeight", 17, section));
-    m_cellText = NativeColour(m_skin.GetRgbColour("TextColor", 0, section));
-    const int disabled = m_skin.GetInt("TextColorDisabled", -1, section);
-    const int accent = m_skin.GetInt("TextColorDown", -1, section);
-    m_list->SetColours(
-        m_cellText, Look().childBg,
-        disabled == -1 ? wxSystemSettings::GetColour(wxSYS_COLOUR_GRAYTEXT)
-                       : NativeColour(m_skin.GetRgbColour("TextColorDisabled", 0, section)),
-        accent == -1 ? wxSystemSettings::GetColour(wxSYS_COLOUR_HIGHLIGHT)
-                     : NativeColour(m_skin.GetRgbColour("TextColorDown", 0, section)));
-    m_list->SetHeaderPicture(LoadSkinPicture(m_skin.GetString("HeaderBack", "", section)),
-                             m_skin.GetInt("HeaderBgMode", 0, section),
-                             m_skin.GetInt("HeadBgTopSplitter", 0, section),
-                             m_skin.GetInt("HeadBgBtmSplitter", 0, section));
+    m_cellText = ApplyListSkin(*m_list, m_skin, section, Look().childBg);
     wxColour colours[4];
     static const char* const kColourKeys[4] = {"TextColorUp", "TextColorDown", "TextColorActive",
                                                "TextColorDisabled"};

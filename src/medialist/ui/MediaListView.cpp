@@ -88,15 +88,6 @@ private:
     CMediaListWnd& m_list;
 };
 
-wxWindow* HeaderOf(XListCtrl& list) {
-    for (wxWindow* child : list.GetChildren()) {
-        if (child != list.Body()) {
-            return child;
-        }
-    }
-    return nullptr;
-}
-
 }  // namespace
 
 void CMediaListWnd::CreateControls() {
@@ -148,7 +139,7 @@ void CMediaListWnd::BindEvents() {
             hub->ShowContextMenu(this, kMediaListContextMenuId);
         }
     });
-    if (wxWindow* header = HeaderOf(*m_list)) {
+    if (wxWindow* header = m_list->Header()) {
         header->Bind(wxEVT_LEFT_DOWN, &CMediaListWnd::OnHeaderLeftDown, this);
     }
 }
@@ -341,27 +332,7 @@ bool CMediaListWnd::OnSkinChanged(const std::string& skinDir) {
     ImSkinPanel::OnSkinChanged(skinDir);
     const char* section = GetSkinSection();
     const wxFont font = MakeSkinFont(m_skin.GetFont(section));
-    m_list->SetFontOfCells(font);
-    m_list->SetRowHeight(m_skin.GetInt("GridHeight", 17, section));
-    m_cellText = NativeColour(m_skin.GetRgbColour("TextColor", 0, section));
-    // The rows stand on the panel's own colour, so a dark skin gets a dark list.
-    const int disabled = m_skin.GetInt("TextColorDisabled", -1, section);
-    const int accent = m_skin.GetInt("TextColorDown", -1, section);
-    m_list->SetColours(m_cellText, Look().childBg,
-                       disabled == -1 ? wxSystemSettings::GetColour(wxSYS_COLOUR_GRAYTEXT)
-                                      : NativeColour(m_skin.GetRgbColour("TextColorDisabled", 0,
-                                                                         section)),
-                       accent == -1 ? wxSystemSettings::GetColour(wxSYS_COLOUR_HIGHLIGHT)
-                                    : NativeColour(m_skin.GetRgbColour("TextColorDown", 0,
-                                                                       section)));
-    const int headerColour = m_skin.GetInt("HeaderBgColor", -1, section);
-    if (auto* header = dynamic_cast<ImHeaderCtrl*>(HeaderOf(*m_list)); header && headerColour != -1) {
-        header->SetSkinColors(NativeColour(static_cast<std::uint32_t>(headerColour)), m_cellText);
-    }
-    m_list->SetHeaderPicture(LoadSkinPicture(m_skin.GetString("HeaderBack", "", section)),
-                             m_skin.GetInt("HeaderBgMode", 0, section),
-                             m_skin.GetInt("HeadBgTopSplitter", 0, section),
-                             m_skin.GetInt("HeadBgBtmSplitter", 0, section));
+    m_cellText = ApplyListSkin(*m_list, m_skin, section, Look().childBg);
     wxColour colours[4];
     static const char* const kColourKeys[4] = {"TextColorUp", "TextColorDown", "TextColorActive",
                                                "TextColorDisabled"};

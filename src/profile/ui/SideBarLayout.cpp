@@ -158,11 +158,55 @@ void CSideBarWnd::LayoutSimpleGroup(int x, int y, int width) {
 }
 
 void CSideBarWnd::LayoutDiscGroup(int x, int y, int width) {
+    const auto heightOf = [](wxWindow* window) {
+        return dynamic_cast<ImLabel*>(window) != nullptr
+                   ? kLabelHeight
+                   : std::max(kEditHeight, window->GetBestSize().y);
+    };
+    int stacked = 0;
     for (wxWindow* window : m_discGroup) {
-        const bool isLabel = dynamic_cast<ImLabel*>(window) != nullptr;
-        const int height = isLabel ? kLabelHeight : std::max(kEditHeight, window->GetBestSize().y);
+        stacked += heightOf(window) + (dynamic_cast<ImLabel*>(window) ? 0 : m_metrics.VSpacing);
+    }
+    const int room = GetClientSize().y - y - m_metrics.BottomMargin;
+    if (stacked <= room) {
+        for (wxWindow* window : m_discGroup) {
+            const bool isLabel = dynamic_cast<ImLabel*>(window) != nullptr;
+            const int height = heightOf(window);
+            window->SetSize(x, y, width, height);
+            y += height + (isLabel ? 0 : m_metrics.VSpacing);
+        }
+        return;
+    }
+    // Labels over boxes do not fit under the player at the design size: each label goes
+    // beside its box instead, in a column as wide as the longest label, so every box stays
+    // visible. A box without a label (the Balance check box) keeps a row of its own.
+    int labelWidth = 0;
+    int rowsHeight = 0;
+    int rows = 0;
+    for (std::size_t i = 0; i < m_discGroup.size(); ++i) {
+        wxWindow* window = m_discGroup[i];
+        if (dynamic_cast<ImLabel*>(window) != nullptr && i + 1 < m_discGroup.size()) {
+            labelWidth = std::max(labelWidth, window->GetTextExtent(window->GetLabel()).x);
+            window = m_discGroup[++i];
+        }
+        rowsHeight += heightOf(window);
+        ++rows;
+    }
+    labelWidth = std::min(labelWidth + m_metrics.HSpacing, width / 2);
+    const int gap = std::clamp((room - rowsHeight) / std::max(1, rows), 0, m_metrics.VSpacing);
+    for (std::size_t i = 0; i < m_discGroup.size(); ++i) {
+        wxWindow* window = m_discGroup[i];
+        if (dynamic_cast<ImLabel*>(window) != nullptr && i + 1 < m_discGroup.size()) {
+            wxWindow* box = m_discGroup[++i];
+            const int height = heightOf(box);
+            window->SetSize(x, y + (height - kLabelHeight) / 2, labelWidth, kLabelHeight);
+            box->SetSize(x + labelWidth, y, std::max(20, width - labelWidth), height);
+            y += height + gap;
+            continue;
+        }
+        const int height = heightOf(window);
         window->SetSize(x, y, width, height);
-        y += height + (isLabel ? 0 : m_metrics.VSpacing);
+        y += height + gap;
     }
 }
 

@@ -246,9 +246,10 @@ void CSideBarWnd::UpdateEnabling() {
     IMainHub* hub = GetMainHub();
     const bool rowSelected = hub != nullptr && !hub->SelectedSets().empty();
     m_bitRateSlider->Enable(rowSelected && m_bitRateAllowed);
+    const bool burning = hub != nullptr && hub->WorkMode() == 2 && hub->IsBurnRunActive();
     for (wxWindow* control :
          std::initializer_list<wxWindow*>{m_sampleRateSlider, m_volumeSlider, m_channels}) {
-        control->Enable(rowSelected);
+        control->Enable(rowSelected && !burning);
     }
     if (m_firstUpdatePass) {
         m_firstUpdatePass = false;

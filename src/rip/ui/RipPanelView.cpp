@@ -63,13 +63,6 @@ XListColumn& ColumnOf(XListCtrl& list, int column) {
     return const_cast<std::vector<XListColumn>&>(list.Columns())[std::size_t(column)];
 }
 
-wxWindow* HeaderOf(XListCtrl& list) {
-    for (wxWindow* child : list.GetChildren()) {
-        if (child != list.Body()) return child;
-    }
-    return nullptr;
-}
-
 std::uint32_t StatusTextId(RipStatus status) {
     switch (status) {
         case RipStatus::Waiting: return riptext::kWaiting;
@@ -173,7 +166,7 @@ void CDRipDlg::BindEvents() {
         }
         if (IMainHub* hub = GetMainHub()) hub->ShowContextMenu(this, kRipContextMenuId);
     });
-    if (wxWindow* header = HeaderOf(*m_list)) {
+    if (wxWindow* header = m_list->Header()) {
         header->Bind(wxEVT_LEFT_DOWN, [this](wxMouseEvent& event) {
             if (!m_running) event.Skip();
         });
@@ -387,23 +380,7 @@ bool CDRipDlg::OnSkinChanged(const std::string& skinDir) {
     ImSkinPanel::OnSkinChanged(skinDir);
     const char* section = GetSkinSection();
     const wxFont font = MakeSkinFont(m_skin.GetFont(section));
-    m_list->SetFontOfCells(font);
-    m_list->SetRowHeight(m_skin.GetInt("GridHeight", 17, section));
-    m_cellText = NativeColour(m_skin.GetRgbColour("TextColor", 0, section));
-    const int disabled = m_skin.GetInt("TextColorDisabled", -1, section);
-    const int accent = m_skin.GetInt("TextColorDown", -1, section);
-    m_list->SetColours(m_cellText, Look().childBg,
-                       disabled == -1 ? wxSystemSettings::GetColour(wxSYS_COLOUR_GRAYTEXT)
-                                      : NativeColour(m_skin.GetRgbColour("TextColorDisabled", 0, section)),
-                       accent == -1 ? wxSystemSettings::GetColour(wxSYS_COLOUR_HIGHLIGHT)
-                                    : NativeColour(m_skin.GetRgbColour("TextColorDown", 0, section)));
-    const int headerColour = m_skin.GetInt("HeaderBgColor", -1, section);
-    if (auto* header = dynamic_cast<ImHeaderCtrl*>(HeaderOf(*m_list)); header && headerColour != -1) {
-        header->SetSkinColors(NativeColour(static_cast<std::uint32_t>(headerColour)), m_cellText);
-    }
-    m_list->SetHeaderPicture(LoadSkinPicture(m_skin.GetString("HeaderBack", "", section)),
-                             m_skin.GetInt("HeaderBgMode", 0, section), m_skin.GetInt("HeadBgTopSplitter", 0, section),
-                             m_skin.GetInt("HeadBgBtmSplitter", 0, section));
+    m_cellText = ApplyListSkin(*m_list, m_skin, section, Look().childBg);
     wxColour colours[4];
     static const char* const kColourKeys[4] = {"TextColorUp", "TextColorDown", "TextColorActive", "TextColorDisabled"};
     for (int i = 0; i < 4; ++i) colours[i] = NativeColour(m_skin.GetRgbColour(kColourKeys[i], 0, section));

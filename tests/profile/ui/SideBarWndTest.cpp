@@ -69,8 +69,10 @@ public:
     bool IsConvertRunActive() override { return false; }
     double RunDoneSeconds() override { return 0; }
     double RunTotalSeconds() override { return 0; }
+    bool IsBurnRunActive() override { return burning; }
 
     int mode = 0;
+    bool burning = false;
     std::vector<ParameterSet*> selected;
     std::vector<std::string> applied;
     std::vector<int> chosen;
@@ -425,6 +427,38 @@ TEST_F(SideBarSets, ModesAndTheBitRateOfLosslessFormats) {
     m_hub.mode = 0;
     m_bar->OnWorkModeChanged(0);
     EXPECT_TRUE(m_bar->FindWindow(sidebar::kSaveProfile)->IsEnabled());
+}
+
+TEST_F(SideBarSets, TheDiscGroupFitsUnderThePlayerAndTheSlidersHoldStillDuringABurn) {
+    m_hub.mode = 2;
+    m_bar->OnWorkModeChanged(2);
+    // The height the bar has under the player in a window of the design size.
+    m_bar->SetSize(230, 250);
+    const wxRect client(wxPoint(0, 0), m_bar->GetClientSize());
+    for (int id : {sidebar::kAlbumLabel, sidebar::kAlbum, sidebar::kIntervalLabel,
+                   sidebar::kInterval, sidebar::kBalance}) {
+        wxWindow* control = m_bar->FindWindow(id);
+        ASSERT_NE(control, nullptr);
+        EXPECT_TRUE(control->IsShown()) << id;
+        EXPECT_TRUE(client.Contains(control->GetRect())) << id << " lies outside the bar";
+    }
+    const wxRect album = m_bar->FindWindow(sidebar::kAlbum)->GetRect();
+    EXPECT_FALSE(album.Intersects(m_bar->FindWindow(sidebar::kAlbumLabel)->GetRect()));
+    // With room to spare the labels stand over their boxes again.
+    m_bar->SetSize(230, 600);
+    EXPECT_LT(m_bar->FindWindow(sidebar::kAlbumLabel)->GetRect().GetBottom(),
+              m_bar->FindWindow(sidebar::kAlbum)->GetRect().GetTop());
+
+    m_bar->UpdateWindowUI();
+    EXPECT_TRUE(m_bar->FindWindow(sidebar::kSampleRateSlider)->IsEnabled());
+    m_hub.burning = true;
+    m_bar->UpdateWindowUI();
+    for (int id : {sidebar::kSampleRateSlider, sidebar::kVolumeSlider, sidebar::kChannels})
+        EXPECT_FALSE(m_bar->FindWindow(id)->IsEnabled()) << id;
+    m_hub.mode = 0;
+    m_bar->UpdateWindowUI();
+    EXPECT_TRUE(m_bar->FindWindow(sidebar::kVolumeSlider)->IsEnabled())
+        << "a burn holds only the burn mode's sliders";
 }
 
 }  // namespace
