@@ -257,40 +257,27 @@ void BurnDriver::RunBurn() {
     for (Slot& slot : m_slots)
         slot = Slot{};
     const int workers = std::clamp(m_settings.maxProcesses, 1, kMaxWorkers);
+    // The stage ends when every worker has returned. Reading the row cursor and the slots
+    // instead saw a worker between taking its row and taking its slot as "all done": the
+    // timers stopped for the rest of the stage, disk check and progress included.
+    m_workersLeft = workers;
     std::vector<std::thread> threads;
     for (int i = 0; i < workers; ++i)
-        threads.emplace_back([this] { ConvertWorker(); });
+        threads.emplace_back([this] {
+            ConvertWorker();
+            --m_workersLeft;
+        });
     // The driver's own timers while the workers run: progress each tick, disk space each third.
     for (int tick = 0;; ++tick) {
-        bool allDone;
-        {
-            std::lock_guard lock(m_cursorLock);
-            allDone = m_rowCursor >= rows - 1;
-        }
+        const bool finished = m_workersLeft.load() == 0;
         ProgressTick();
         if (tick % 3 == 2)
             CheckDiskSpace();
-        if (allDone || m_abort) {
-            bool anyBusy = false;
-            {
-                std::lock_guard lock(m_slotLock);
-                for (const Slot& slot : m_slots)
-                    anyBusy |= slot.row >= 0;
-            }
-            if (!anyBusy)
-                break;
-        }
-        // In steps of 100 ms, so a Stop or the last row's end is seen at once.
-        for (int waited = 0; waited < m_tickPeriodMs && !m_abort; waited += 100) {
+        if (finished)
+            break;
+        // In steps of 100 ms, so the last worker's end is seen at once.
+        for (int waited = 0; waited < m_tickPeriodMs && m_workersLeft.load() > 0; waited += 100)
             std::this_thread::sleep_for(std::chrono::milliseconds(std::min(100, m_tickPeriodMs)));
-            std::lock_guard lock(m_slotLock);
-            if (std::none_of(std::begin(m_slots), std::end(m_slots),
-                             [](const Slot& slot) { return slot.row >= 0; })) {
-                std::lock_guard cursor(m_cursorLock);
-                if (m_rowCursor >= rows - 1)
-                    break;
-            }
-        }
     }
     for (std::thread& thread : threads)
         thread.join();

@@ -191,6 +191,7 @@ private:
     std::atomic<int> m_burnActive{0};
     std::atomic<int> m_abort{0};
     std::atomic<int> m_converting{0};
+    std::atomic<int> m_workersLeft{0};  // conversion workers not yet returned
     std::atomic<int> m_writing{0};
     std::atomic<int> m_ejectRequested{0};
     std::atomic<int> m_discChecked{0};

@@ -10,9 +10,12 @@
 
 #include <gtest/gtest.h>
 
+#include <sys/mount.h>
 #include <sys/stat.h>
 
+#include <cerrno>
 #include <chrono>
+#include <cstring>
 #include <filesystem>
 #include <fstream>
 #include <thread>
@@ -44,7 +47,7 @@ protected:
                "case \"$1\" in *slow*) sleep 30;; esac\n"
                "echo '|Time>>> 1'\n"
                "sleep 0.05\n"
-               "cp \"$1\" \"$2\"\n"
+               "cp \"$1\" \"$2\" || exit 1\n"
                "echo end >> '"
             << log << "'\n";
         ::chmod(tool.c_str(), 0755);
@@ -300,6 +303,60 @@ TEST_F(BurnDriverTest, LowDiskDuringConversionStopsTheRun) {
     ASSERT_TRUE(Run());
     EXPECT_TRUE(host.Asked(text::kDiskFull));
     EXPECT_TRUE(recorder.jobs.empty());
+    EXPECT_TRUE(TemporaryFolderEmpty());
+}
+
+// A real file system that runs full: a tmpfs of 256 KiB the test mounts (root only; skipped
+// where mounting is not allowed). The tool's writes fail and the disk check trips; either way
+// the run ends with the disk-full message, writes nothing, and leaves no file behind.
+TEST_F(BurnDriverTest, TemporaryFolderOnAFullFileSystemStopsAndLeavesNothing) {
+    const std::string small = dir / "small";
+    fs::create_directories(small);
+    if (::mount("tmpfs", small.c_str(), "tmpfs", MS_NOSUID | MS_NODEV, "size=256k") != 0)
+        GTEST_SKIP() << "cannot mount a tmpfs here: " << std::strerror(errno);
+    struct Unmount {
+        std::string path;
+        ~Unmount() { ::umount2(path.c_str(), MNT_DETACH); }
+    } unmount{small};
+    temporary = small + "/burntemp";
+    settings.temporaryFolder = temporary;
+    const std::string first = AddWav("slow one.wav", 44100);
+    AddWav("two.wav", 44100);
+    AddWav("three.wav", 44100);
+    const auto before = fs::file_size(first);
+    ASSERT_TRUE(Run());
+    EXPECT_TRUE(host.Asked(text::kDiskFull));
+    EXPECT_TRUE(recorder.jobs.empty());
+    EXPECT_FALSE(host.allWritten);
+    EXPECT_TRUE(TemporaryFolderEmpty());
+    EXPECT_EQ(fs::file_size(first), before) << "the source is never touched";
+}
+
+// The same full file system with a disk check that sees room: the tool's failed writes fail
+// their rows, the rows that fit are burnt, and the pieces of the others are gone.
+TEST_F(BurnDriverTest, RowsWhoseWavDoesNotFitFailAndTheRestAreBurnt) {
+    const std::string small = dir / "small";
+    fs::create_directories(small);
+    if (::mount("tmpfs", small.c_str(), "tmpfs", MS_NOSUID | MS_NODEV, "size=256k") != 0)
+        GTEST_SKIP() << "cannot mount a tmpfs here: " << std::strerror(errno);
+    struct Unmount {
+        std::string path;
+        ~Unmount() { ::umount2(path.c_str(), MNT_DETACH); }
+    } unmount{small};
+    temporary = small + "/burntemp";
+    settings.temporaryFolder = temporary;
+    settings.maxRunningProcesses = 1;  // in order: the first fits, the next two do not
+    driver->SetFreeSpaceProbe([](const std::string&) { return std::uint64_t{1} << 40; });
+    AddWav("one.wav", 44100);
+    AddWav("two.wav", 44100);
+    AddWav("three.wav", 44100);
+    ASSERT_TRUE(Run());
+    EXPECT_EQ(host.TimesAsked(text::kSomeFailed), 1);
+    ASSERT_EQ(recorder.jobs.size(), 1u);
+    EXPECT_EQ(recorder.jobs[0].tracks.size(), 1u);
+    EXPECT_EQ(list.Item(0)->Status(), JobStatus::Completed);
+    EXPECT_EQ(list.Item(1)->Status(), JobStatus::Failed);
+    EXPECT_EQ(list.Item(2)->Status(), JobStatus::Failed);
     EXPECT_TRUE(TemporaryFolderEmpty());
 }
 

@@ -245,11 +245,17 @@ TEST_F(PlayerTest, AfterASeekFarFromAKeyFrameSoundComesFirstAndPicturesCatchUp) 
     ASSERT_TRUE(WaitFor([] { return avp_get_cur_pos() > 0.2; }));
     avp_set_cur_pos(6.0);
     ASSERT_TRUE(WaitFor([] { return avp_get_cur_pos() > 6.0; }, 2000ms));
-    std::this_thread::sleep_for(700ms);
-    const double clock = avp_get_cur_pos();
-    std::lock_guard lock(mutex);
-    EXPECT_GT(lastPicture, 6.0);
-    EXPECT_NEAR(lastPicture, clock, 0.15);
+    // How long the catching up takes depends on the machine (and on a sanitizer's slowdown);
+    // what counts is that the pictures reach the sound and then keep in step with it.
+    const auto inStep = [&] {
+        std::lock_guard lock(mutex);
+        return lastPicture > 6.0 && std::abs(lastPicture - avp_get_cur_pos()) < 0.15;
+    };
+    EXPECT_TRUE(WaitFor(inStep, 10000ms)) << "the pictures never caught up with the sound";
+    if (avp_get_cur_pos() < 7.5) {
+        std::this_thread::sleep_for(300ms);
+        EXPECT_TRUE(WaitFor(inStep, 200ms)) << "the pictures fell behind again";
+    }
 }
 
 TEST_F(PlayerTest, OddAndDamagedFilesPlayWithoutHanging) {

@@ -362,12 +362,14 @@ void CCDCreatorPanel::RecalcLayout() {
         client.x - 2 * m_endSpacing - m_leftEnd->GetSize().x - m_rightEnd->GetSize().x - 8;
     std::array<wxSize, 7> sizes;
     // Words beside the glyphs while the row has room for them: first the arrows of the two moves
-    // go without theirs, then every button; each keeps its word as a tool tip.
+    // go without theirs, then the list's own Add, Remove and Clear (German's words are long),
+    // then Burn and Stop too; each keeps its word as a tool tip.
     int tallest = std::max(m_leftEnd->GetSize().y, m_rightEnd->GetSize().y);
-    for (int wordless = 0; wordless <= 2; ++wordless) {
-        int total = 6 * 12;
+    for (int wordless = 0; wordless <= 3; ++wordless) {
+        int total = 6 * 6;
         for (std::size_t i = 0; i < kButtons.size(); ++i) {
-            const bool hide = wordless == 2 || (wordless == 1 && i >= 5);
+            const bool hide = wordless == 3 || (wordless >= 1 && i >= 5) ||
+                              (wordless >= 2 && i < kBurnButton);
             m_buttons[i]->SetTextShown(!hide);
             m_buttons[i]->SetToolTip(hide ? m_buttons[i]->GetLabel() : wxString());
             FitIconButton(*m_buttons[i], 24);
