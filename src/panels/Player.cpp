@@ -77,7 +77,7 @@ public:
             return;
         }
         std::lock_guard sdl(SdlAudioLock());
-        m_sdlAudio = SDL_InitSubSystem(SDL_INIT_AUDIO) == 0;
+        m_sdlAudio = InitSdlAudio();
     }
 
     void Deinit() {

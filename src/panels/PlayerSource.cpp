@@ -1,6 +1,7 @@
 #include "panels/PlayerSource.h"
 
 #include "ctt/Sources.h"
+#include "medialist/CueSheet.h"
 
 #include <algorithm>
 #include <climits>
@@ -229,11 +230,11 @@ private:
     std::deque<std::unique_ptr<AVPacket, PacketFreer>> m_putOff;
 };
 
-// A track of an audio CD: the conversion tool's reader, so the preview hears exactly what a rip
-// would read.
-class CdaSource final : public PlayerSource {
+// A track of an audio CD, or the span of a file a cue sheet's track names: the conversion
+// tool's readers, so the preview hears exactly what a rip or a conversion would read.
+class ReaderSource final : public PlayerSource {
 public:
-    explicit CdaSource(std::unique_ptr<ctt::AudioSource> reader) : m_reader(std::move(reader)) {
+    explicit ReaderSource(std::unique_ptr<ctt::AudioSource> reader) : m_reader(std::move(reader)) {
         m_frame.reset(av_frame_alloc());
     }
 
@@ -269,13 +270,28 @@ private:
 }  // namespace
 
 std::unique_ptr<PlayerSource> OpenPlayerSource(const std::string& path) {
+    std::string error;
     if (ctt::IsCdaPath(path)) {
-        std::string error;
         std::unique_ptr<ctt::AudioSource> reader = ctt::OpenCdSource(path, error);
         if (!reader) {
             return nullptr;
         }
-        return std::make_unique<CdaSource>(std::move(reader));
+        return std::make_unique<ReaderSource>(std::move(reader));
+    }
+    if (const auto cue = SplitCueTrackPath(path)) {
+        CueTrackSpan span;
+        if (!ResolveCueTrack(cue->sheet, cue->track, span, error)) {
+            return nullptr;
+        }
+        const std::int64_t startUs = span.startFrame * 1000000 / kCueFramesPerSecond;
+        const std::int64_t endUs =
+            span.endFrame < 0 ? -1 : span.endFrame * 1000000 / kCueFramesPerSecond;
+        std::unique_ptr<ctt::AudioSource> reader =
+            ctt::OpenFileSource(span.audioPath, startUs, endUs, error);
+        if (!reader) {
+            return nullptr;
+        }
+        return std::make_unique<ReaderSource>(std::move(reader));
     }
     auto source = std::make_unique<FileSource>();
     if (!source->Open(path)) {

@@ -1,8 +1,9 @@
 #pragma once
-// What the preview decodes from: a media file through libavformat and libavcodec, or one track
+// What the preview decodes from: a media file through libavformat and libavcodec, one track
 // of an audio CD or disc image ("DRIVE/TrackNN.cda") through the conversion tool's libcdio
-// reader. A source hands out decoded frames with their place in seconds from the start of the
-// file; it knows nothing of queues, clocks or devices.
+// reader, or one track of a cue sheet ("SHEET|N") through its reader of file spans. A source
+// hands out decoded frames with their place in seconds from the start of the file (of the
+// track, for the last two); it knows nothing of queues, clocks or devices.
 //
 // Thread contract: one thread at a time (the preview's decoding thread after avp_open).
 

@@ -5,6 +5,8 @@
 //
 // Thread contract: any thread.
 
+#include <SDL.h>
+
 #include <mutex>
 
 namespace ac {
@@ -12,6 +14,14 @@ namespace ac {
 inline std::mutex& SdlAudioLock() {
     static std::mutex lock;
     return lock;
+}
+
+// Call with SdlAudioLock held. The audio subsystem brings SDL's event subsystem, which by
+// default takes SIGINT and SIGTERM for a quit event nobody here reads: the program then
+// ignored kill and the desktop's log-out once anything had played. Those signals stay ours.
+inline bool InitSdlAudio() {
+    SDL_SetHint(SDL_HINT_NO_SIGNAL_HANDLERS, "1");
+    return SDL_InitSubSystem(SDL_INIT_AUDIO) == 0;
 }
 
 }  // namespace ac

@@ -70,7 +70,7 @@ private:
         // SDL's set-up and tear-down of the audio subsystem are not safe against each other.
         {
             std::lock_guard lock(SdlAudioLock());
-            if (SDL_InitSubSystem(SDL_INIT_AUDIO) != 0) {
+            if (!InitSdlAudio()) {
                 return;
             }
         }

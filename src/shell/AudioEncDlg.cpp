@@ -183,6 +183,7 @@ void CAudioEncDlg::CreatePanels() {
     auto* player = new CPlayerWnd(this);
     player->SetModeList(0, &ConvertPreviewList());
     player->SetModeList(1, &RipPreviewList());
+    player->SetModeList(2, &BurnPreviewList());
     m_panels[Player] = player;
     m_panels[Rip] = new CDRipDlg(this, platform::MakeDiscDevice());
     m_panels[Player]->SetSize(-1, kPlayerHeight);

@@ -124,6 +124,11 @@ void CBurnMode::SelectionChanged() {
         g_SideBar->SetSets(sets);
         g_SideBar->FollowSelection(sets);
     }
+    // The file information follows the burn list's selection as it follows the convert list's.
+    if (IMainHub* hub = GetMainHub()) {
+        const int row = m_panel.FirstSelectedRow();
+        hub->ShowFileInfo(row >= 0 ? m_panel.Item(row) : nullptr);
+    }
     if (g_StatusWnd == nullptr || m_panel.Driver().BurnActive())
         return;
     // Between runs only the selected row's child talks to the status panel and the log, and a

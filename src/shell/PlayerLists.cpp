@@ -1,5 +1,6 @@
 #include "shell/PlayerLists.h"
 
+#include "burn/ui/CDCreatorPanel.h"
 #include "convert/MediaItem.h"
 #include "medialist/ui/MediaListWnd.h"
 #include "rip/ui/RipPanel.h"
@@ -70,6 +71,41 @@ public:
     }
 };
 
+class BurnRows final : public IPreviewList {
+public:
+    int RowCount() override { return g_CreatorPanel != nullptr ? g_CreatorPanel->RowCount() : 0; }
+    int FirstSelected() override {
+        return g_CreatorPanel != nullptr ? g_CreatorPanel->FirstSelectedRow() : -1;
+    }
+    void MarkRow(int row, bool selected) override {
+        if (g_CreatorPanel != nullptr && selected && row >= 0 && row < RowCount()) {
+            g_CreatorPanel->SelectRows({row});
+        }
+    }
+    std::string RowPath(int row) override {
+        MediaItem* item = Item(row);
+        return item != nullptr ? item->sourcePath : std::string();
+    }
+    bool CanPlay(int row) override {
+        MediaItem* item = Item(row);
+        return item != nullptr && item->Status() != JobStatus::UnknownFile;
+    }
+    double RowSeconds(int row) override {
+        MediaItem* item = Item(row);
+        if (item == nullptr) {
+            return 0;
+        }
+        return item->info.hours * 3600.0 + item->info.minutes * 60.0 + item->info.seconds;
+    }
+
+private:
+    static MediaItem* Item(int row) {
+        return g_CreatorPanel != nullptr && row >= 0 && row < g_CreatorPanel->RowCount()
+                   ? g_CreatorPanel->Item(row)
+                   : nullptr;
+    }
+};
+
 }  // namespace
 
 IPreviewList& ConvertPreviewList() {
@@ -80,6 +116,11 @@ IPreviewList& ConvertPreviewList() {
 IPreviewList& RipPreviewList() {
     static RipTracks tracks;
     return tracks;
+}
+
+IPreviewList& BurnPreviewList() {
+    static BurnRows rows;
+    return rows;
 }
 
 }  // namespace ac

@@ -1,6 +1,5 @@
 #pragma once
-// The preview panel's view of the convert and rip lists. The burn list brings its own when its
-// panel comes: CPlayerWnd::SetModeList(2, ...) with an IPreviewList over its rows.
+// The preview panel's view of the lists of the three work modes.
 //
 // Thread contract: UI thread only.
 
@@ -12,5 +11,7 @@ namespace ac {
 // panels through their global pointers, so one of each serves the program's whole run.
 IPreviewList& ConvertPreviewList();
 IPreviewList& RipPreviewList();
+// Mode 2: rows of g_CreatorPanel.
+IPreviewList& BurnPreviewList();
 
 }  // namespace ac

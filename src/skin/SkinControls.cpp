@@ -214,10 +214,20 @@ void ImSlider::OnPaint(wxPaintEvent& /*event*/) {
     dc.SetBackground(wxBrush(m_bgColour));
     dc.Clear();
     if (text) {
+        // The time band is a shade of the panel's own colour towards its text, so the time
+        // reads on a light skin and a dark one alike (fixed greys left light text unreadable).
+        const auto towardText = [this](int percent) {
+            const auto mix = [percent](unsigned char from, unsigned char to) {
+                return static_cast<unsigned char>(from + (to - from) * percent / 100);
+            };
+            return wxColour(mix(m_bgColour.Red(), m_textColour.Red()),
+                            mix(m_bgColour.Green(), m_textColour.Green()),
+                            mix(m_bgColour.Blue(), m_textColour.Blue()));
+        };
         dc.SetPen(*wxTRANSPARENT_PEN);
-        dc.SetBrush(wxBrush(wxColour(0xDF, 0xE1, 0xE4)));
+        dc.SetBrush(wxBrush(towardText(10)));
         dc.DrawRectangle(0, 0, w, 11);
-        dc.SetBrush(wxBrush(wxColour(0xC0, 0xC5, 0xCA)));
+        dc.SetBrush(wxBrush(towardText(25)));
         dc.DrawRectangle(0, 11, w, 2);
         DrawTiledPicture(dc, wxRect(0, trackY, w, std::max(1, m_bg.Height())), m_bg);
     } else if (m_bg.IsOk()) {

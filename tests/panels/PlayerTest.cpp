@@ -334,6 +334,31 @@ TEST_F(PlayerTest, CdTrackOfADiscImagePlaysAndSeeks) {
     EXPECT_EQ(avp_open((m_dir.Path() + "/disc.cue/Track07.cda").c_str()), 0);
 }
 
+TEST_F(PlayerTest, CueTrackPlaysItsOwnSpanOfTheFile) {
+    MakeCountingWav("album.wav", 8.0);
+    const std::string sheet = m_dir / "album.cue";
+    test::WriteFile(sheet, "FILE \"album.wav\" WAVE\n  TRACK 01 AUDIO\n    INDEX 01 00:00:00\n"
+                           "  TRACK 02 AUDIO\n    INDEX 01 00:05:00\n");
+    ASSERT_EQ(avp_open((sheet + "|1").c_str()), 1);
+    EXPECT_NEAR(avp_get_length(), 5.0, 1.0 / 75);
+    ASSERT_EQ(avp_open((sheet + "|2").c_str()), 1);
+    EXPECT_NEAR(avp_get_length(), 3.0, 1.0 / 75);
+    avp_toggle_pause();
+    {
+        Playback playback;
+        ASSERT_TRUE(WaitFor([] { return player::PeekQueuedSound(1).size() == 2; }));
+        EXPECT_EQ(FrameIndexOf(player::PeekQueuedSound(1)), 5 * 44100)
+            << "the second track starts at its own INDEX 01";
+        avp_set_cur_pos(2.0);
+        ASSERT_TRUE(WaitFor([] { return player::PeekQueuedSound(1).size() == 2; }));
+        EXPECT_NEAR(FrameIndexOf(player::PeekQueuedSound(1)), 7 * 44100, 588);
+        avp_stop();
+    }
+    EXPECT_EQ(avp_open((sheet + "|3").c_str()), 0) << "no third track";
+    test::WriteFile(m_dir / "lost.cue", "FILE \"gone.wav\" WAVE\n  TRACK 01 AUDIO\n    INDEX 01 00:00:00\n");
+    EXPECT_EQ(avp_open((m_dir / "lost.cue|1").c_str()), 0) << "the sheet's file is missing";
+}
+
 TEST_F(PlayerTest, DeinitEndsEverythingAndASecondInitWorks) {
     ASSERT_EQ(avp_open(MakeCountingWav("again.wav", 4.0).c_str()), 1);
     Playback playback;

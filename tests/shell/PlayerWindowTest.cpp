@@ -8,6 +8,7 @@
 
 #include <gtest/gtest.h>
 
+#include <csignal>
 #include <cstdlib>
 
 namespace {
@@ -108,6 +109,39 @@ TEST_F(PlayerWindowTest, RemovingTheRowOrSwitchingTheTabStopsPlayback) {
     EXPECT_EQ(Field(state, "player_state"), "stopped");
     EXPECT_EQ(state.count("row1"), 0u);
     program.Send("close");
+    EXPECT_TRUE(program.WaitForExit());
+}
+
+TEST_F(PlayerWindowTest, TheBurnListPlaysItsRowsAndTheFileInformationFollowsIt) {
+    Program program(m_home);
+    ASSERT_FALSE(program.WaitShown().empty());
+    program.Send("tab 2");
+    program.WaitFor([](const State& s) { return Field(s, "mode") == "2"; });
+    program.Send("burnadd " + m_files / "one.wav");
+    program.Send("burnadd " + m_files / "two.wav");
+    program.WaitFor([](const State& s) { return s.count("burnrow1") > 0; });
+    program.Send("command 33045");  // Show File Information
+    const auto emptyPage = std::atol(Field(program.WaitFor([](const State& s) {
+        return Field(s, "fileinfo_shown") == "1";
+    }), "fileinfo_bytes").c_str());
+    program.Send("burnselect 1");
+    State state = program.WaitFor([emptyPage](const State& s) {
+        return std::atol(Field(s, "fileinfo_bytes").c_str()) > emptyPage;
+    });
+    EXPECT_GT(std::atol(Field(state, "fileinfo_bytes").c_str()), emptyPage)
+        << "the selected burn row's details";
+
+    program.Send("command 1006");
+    state = program.WaitFor([](const State& s) { return Is("playing")(s) && PositionMs(s) > 200; });
+    ASSERT_EQ(Field(state, "player_state"), "playing");
+    EXPECT_EQ(Field(state, "player_row"), "1");
+    program.Send("command 1015");  // the previous row
+    state = program.WaitFor([](const State& s) { return Field(s, "player_row") == "0"; });
+    EXPECT_EQ(Field(state, "player_state"), "playing");
+    program.Send("command 32772");  // Remove the selected row
+    EXPECT_EQ(Field(program.WaitFor(Is("stopped")), "player_state"), "stopped");
+    // Once sound has played, SIGTERM still ends the program (the sound library would take it).
+    program.Signal(SIGTERM);
     EXPECT_TRUE(program.WaitForExit());
 }
 

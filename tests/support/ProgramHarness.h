@@ -122,6 +122,13 @@ public:
         std::filesystem::rename(temp, m_hook + "/command.txt");
     }
 
+    // A signal to the program, as kill(1) or the desktop's log-out sends it.
+    void Signal(int number) {
+        if (Running()) {
+            ::kill(m_pid, number);
+        }
+    }
+
     std::string Settings() const {
         return Slurp(m_home + "/.config/audio-converter/settings.ini");
     }

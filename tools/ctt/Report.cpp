@@ -2,20 +2,12 @@
 
 #include <cerrno>
 #include <cstdio>
-#include <mutex>
 #include <unistd.h>
-
-extern "C" {
-#include <libavutil/log.h>
-}
-#include <cdio/logging.h>
 
 namespace ac::ctt {
 namespace {
 
 bool s_outputGone = false;
-std::mutex s_logMutex;
-std::string s_lastLibraryError;
 
 void WriteLine(int fd, const std::string& line) {
     const char* p = line.data();
@@ -36,29 +28,6 @@ void WriteLine(int fd, const std::string& line) {
     }
 }
 
-void FfmpegLog(void* avcl, int level, const char* fmt, va_list args) {
-    if (level > AV_LOG_ERROR) {
-        return;
-    }
-    char text[512];
-    int prefix = 1;
-    av_log_format_line2(avcl, level, fmt, args, text, sizeof text, &prefix);
-    std::string message(text);
-    while (!message.empty() && (message.back() == '\n' || message.back() == '\r')) {
-        message.pop_back();
-    }
-    std::lock_guard<std::mutex> lock(s_logMutex);
-    s_lastLibraryError = message;
-}
-
-void CdioLog(cdio_log_level_t level, const char* message) {
-    if (level < CDIO_LOG_ERROR || !message) {
-        return;
-    }
-    std::lock_guard<std::mutex> lock(s_logMutex);
-    s_lastLibraryError = message;
-}
-
 }  // namespace
 
 void ReportTime(double seconds) {
@@ -76,15 +45,5 @@ void ReportWarning(const std::string& text) {
 }
 
 bool OutputGone() { return s_outputGone; }
-
-void InstallLibraryLogHooks() {
-    av_log_set_callback(FfmpegLog);
-    cdio_log_set_handler(CdioLog);
-}
-
-std::string LastLibraryError() {
-    std::lock_guard<std::mutex> lock(s_logMutex);
-    return s_lastLibraryError;
-}
 
 }  // namespace ac::ctt
