@@ -11,10 +11,6 @@
 #include "shell/AudioEncDlg.h"
 #include "shell/TestHook.h"
 
-extern "C" {
-#include <libavutil/log.h>
-}
-
 #include <wx/snglinst.h>
 #include <wx/wx.h>
 
@@ -103,9 +99,6 @@ class CAudioEncApp : public wxApp {
 public:
     bool OnInit() override {
         s_defaultAssertHandler = wxSetAssertHandler(IgnoreMenuIdAssert);
-        // Probing runs in this process; a row's reason says in words why a file cannot be read,
-        // so FFmpeg's own complaints stay off the terminal the program was started from.
-        av_log_set_level(AV_LOG_QUIET);
         ac::AppConfig& config = ac::GetAppConfig();
         const ac::ProductStrings& product = config.GetProductStrings();
         SetAppDisplayName(wxString::FromUTF8(product.productName));

@@ -53,6 +53,9 @@ for _ in $(seq 300); do
 done
 grep -q '^row0=tone' "$hook/state.txt" 2>/dev/null || { cat "$work/window.log" >&2; fail "the installed window did not list tone.wav"; }
 grep -q '^profiles=10' "$hook/state.txt" || fail "the installed window found no system profiles"
+# Read through the installed media module: a row it could not probe has no duration.
+grep -q '^row0=tone	00:00:02' "$hook/state.txt" \
+  || { cat "$work/window.log" >&2; fail "the installed window could not read tone.wav (media module)"; }
 echo close > "$hook/command.txt"
 wait || true
 

@@ -1,6 +1,7 @@
 // The real program's main window: placement, single instance, tabs, skins and languages.
 // Runs under xvfb-run.
 
+#include "../support/AudioFixtures.h"
 #include "../support/PackageDir.h"
 #include "../support/ProgramHarness.h"
 #include "../support/RunTool.h"
@@ -23,6 +24,29 @@ protected:
     void SetUp() override { ASSERT_NE(::getenv("DISPLAY"), nullptr) << "run under xvfb-run"; }
     ac::test::TempDir m_home;
 };
+
+// FFmpeg and SDL are loaded with the first file, not at the start: they are most of what the
+// start would load, and a window that is only opened to be closed again never needs them.
+TEST_F(MainWindowTest, TheMediaLibrariesComeWithTheFirstFileNotWithTheWindow) {
+    const auto mapped = [](pid_t pid, const char* library) {
+        const std::string maps = Program::Slurp("/proc/" + std::to_string(pid) + "/maps");
+        return maps.find(library) != std::string::npos;
+    };
+    ac::test::TempDir media;
+    ASSERT_TRUE(ac::test::RunFfmpeg("-f lavfi -i sine=duration=1 '" + (media / "b.wav") + "'"));
+    Program program(m_home);
+    ASSERT_FALSE(program.WaitShown().empty());
+    EXPECT_FALSE(mapped(program.Pid(), "libavformat")) << "FFmpeg came with the window";
+    EXPECT_FALSE(mapped(program.Pid(), "libSDL2")) << "SDL came with the window";
+    EXPECT_FALSE(mapped(program.Pid(), "libac-media"));
+    program.Send("add " + media / "b.wav");
+    const State state = program.WaitFor([](const State& s) { return s.count("row0") > 0; });
+    EXPECT_NE(state.at("row0").find("00:00:01"), std::string::npos) << state.at("row0");
+    EXPECT_TRUE(mapped(program.Pid(), "libac-media"));
+    EXPECT_TRUE(mapped(program.Pid(), "libavformat"));
+    program.Send("close");
+    EXPECT_TRUE(program.WaitForExit());
+}
 
 TEST_F(MainWindowTest, FirstStartIsCentredAtItsDefaultSizeAndClosingRemembersThePlace) {
     {

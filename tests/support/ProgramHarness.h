@@ -122,6 +122,8 @@ public:
         std::filesystem::rename(temp, m_hook + "/command.txt");
     }
 
+    pid_t Pid() const { return m_pid; }
+
     // A signal to the program, as kill(1) or the desktop's log-out sends it.
     void Signal(int number) {
         if (Running()) {
