@@ -10,6 +10,7 @@
 
 #include <algorithm>
 #include <cctype>
+#include <unordered_map>
 
 namespace ac {
 
@@ -72,6 +73,18 @@ SkinPicture LoadSkinPicture(const std::string& fileName) {
         return picture;
     }
     const std::string path = g_Skin.GetImagePath(&g_Language, fileName);
+    // Panels share many pictures (list ends, buttons, headers) and each loads its own at every
+    // skin change: decoding each file once per skin halves the first paint's picture work.
+    // Bitmaps and images share their pixels when copied, so a hit costs nothing.
+    static std::string s_cachedSkin;
+    static std::unordered_map<std::string, SkinPicture> s_cache;
+    if (s_cachedSkin != g_Skin.GetSkinDir()) {
+        s_cache.clear();
+        s_cachedSkin = g_Skin.GetSkinDir();
+    }
+    if (auto found = s_cache.find(path); found != s_cache.end()) {
+        return found->second;
+    }
     if (EndsWithPng(fileName)) {
         wxImage image = LoadImageResource(path);
         if (image.IsOk()) {
@@ -85,6 +98,7 @@ SkinPicture LoadSkinPicture(const std::string& fileName) {
             picture.image = picture.bitmap.ConvertToImage();
         }
     }
+    s_cache.emplace(path, picture);
     return picture;
 }
 

@@ -345,7 +345,8 @@ TEST_F(BurnDriverTest, RowsWhoseWavDoesNotFitFailAndTheRestAreBurnt) {
     } unmount{small};
     temporary = small + "/burntemp";
     settings.temporaryFolder = temporary;
-    settings.maxRunningProcesses = 1;  // in order: the first fits, the next two do not
+    settings.maxProcesses = 1;  // one worker, in order: the first fits, the next two do not
+    settings.maxRunningProcesses = 1;
     driver->SetFreeSpaceProbe([](const std::string&) { return std::uint64_t{1} << 40; });
     AddWav("one.wav", 44100);
     AddWav("two.wav", 44100);
