@@ -102,6 +102,9 @@ void CFileInfoWnd::ShowInfo(bool show) {
         }
         return;
     }
+    if (m_picturesPending) {
+        ApplyPictures();
+    }
     if (!IsShown()) {
         Show();
     }
@@ -145,6 +148,18 @@ void CFileInfoWnd::OnLanguageChanged() {
 bool CFileInfoWnd::OnSkinChanged(const std::string& skinDir) {
     m_skin.Load(skinDir);
     m_bgColor = m_skin.GetString("BodyBgColor", "#F3F6FA", "FileInfo");
+    // The window starts hidden and most sessions never open it: its pictures and shape wait
+    // for the first showing instead of slowing the program's start.
+    m_picturesPending = true;
+    if (IsShown()) {
+        ApplyPictures();
+        WritePage();
+    }
+    return true;
+}
+
+void CFileInfoWnd::ApplyPictures() {
+    m_picturesPending = false;
     m_frame = LoadSkinPicture("Beer1.bmp");
     m_cornerLeft = LoadRegionResource(g_Skin.GetImagePath(&g_Language, "fileinfoLT.bmp"));
     m_cornerRight = LoadRegionResource(g_Skin.GetImagePath(&g_Language, "fileinfoRT.bmp"));
@@ -159,11 +174,7 @@ bool CFileInfoWnd::OnSkinChanged(const std::string& skinDir) {
     m_closeButton->SetSize(m_closeButton->CellSize());
     wxSizeEvent size(GetSize());
     OnSize(size);
-    if (IsShown()) {
-        WritePage();
-    }
     Refresh();
-    return true;
 }
 
 void CFileInfoWnd::OnSize(wxSizeEvent& /*event*/) {

@@ -50,6 +50,7 @@ public:
 
 private:
     void WritePage();
+    void ApplyPictures();
     void OnPaint(wxPaintEvent& event);
     void OnSize(wxSizeEvent& event);
     void OnMouse(wxMouseEvent& event);
@@ -68,6 +69,7 @@ private:
     SkinPicture m_frame;
     std::vector<SkinRect> m_cornerLeft;
     std::vector<SkinRect> m_cornerRight;
+    bool m_picturesPending = false;
     wxFont m_titleFont;
     wxColour m_titleColour{0x80, 0x80, 0x80};
     // A drag in progress: which edges move (0: the whole window), from where.
