@@ -155,10 +155,15 @@ bool CCDCreatorPanel::HasName(const std::string& name) const {
                        [&](const auto& row) { return SameName(row->name, name); });
 }
 
-void CCDCreatorPanel::Refuse(const std::string& path, int reason) {
+CFileAddErrorWnd& CCDCreatorPanel::Refused() {
+    // Made at the first refusal: most sessions never need it, and it costs the start.
     if (m_refused == nullptr)
-        return;
-    m_refused->AddRefusedFile(path, static_cast<CFileAddErrorWnd::Reason>(reason));
+        m_refused = new CFileAddErrorWnd();
+    return *m_refused;
+}
+
+void CCDCreatorPanel::Refuse(const std::string& path, int reason) {
+    Refused().AddRefusedFile(path, static_cast<CFileAddErrorWnd::Reason>(reason));
 }
 
 void CCDCreatorPanel::AddFiles() {
@@ -537,8 +542,7 @@ bool CCDCreatorPanel::OnCommand(int id) {
             MoveDown();
             break;
         case kShowMessage:
-            if (m_refused)
-                m_refused->Show();
+            Refused().Show();
             break;
         default:
             return false;

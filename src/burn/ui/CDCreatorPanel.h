@@ -176,6 +176,7 @@ private:
     void Renumber();
     void SwapRows(int first, int second);
     void Refuse(const std::string& path, int reason);
+    CFileAddErrorWnd& Refused();
     bool HasName(const std::string& name) const;
     std::unique_ptr<MediaItem> MakeItem(const std::string& sourcePath) const;
     void SyncSelection();

@@ -101,7 +101,6 @@ CCDCreatorPanel::CCDCreatorPanel(wxWindow* parent)
     : ImSkinPanel(parent, 1001, "CDCreatorPanel", kCreatorDialogId),
       m_timer(this, kTimerId),
       m_alive(std::make_shared<CCDCreatorPanel*>(this)) {
-    m_refused = new CFileAddErrorWnd();
     m_driver = std::make_unique<burn::BurnDriver>(
         *this, *this,
         [](int row, MediaItem& item, const std::string& folder) {

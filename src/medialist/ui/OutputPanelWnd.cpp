@@ -61,10 +61,8 @@ COutputPanelWnd::COutputPanelWnd(wxWindow* parent)
     m_showType = config.GetInt("last_run_function");
     CreateControls();
     FollowSkinColoursBelow(this);
-    m_spin->SetRange(kCopiesMin, kCopiesMax);
-    const int copies = std::clamp(config.GetInt("burncopies"), kCopiesMin, kCopiesMax);
-    m_spin->SetValue(copies);
-    m_copies->ChangeValue(std::to_string(copies));
+    m_copies->ChangeValue(
+        std::to_string(std::clamp(config.GetInt("burncopies"), kCopiesMin, kCopiesMax)));
     // A folder that cannot be made stays unmade: the driver reports it when a job starts.
     platform::EnsureDirectory(ReadFolderKey(config, "OutputDir"), kUserFolderMode);
     platform::EnsureDirectory(ReadFolderKey(config, "OutputCDDir"), kUserFolderMode);
@@ -91,7 +89,6 @@ void COutputPanelWnd::CreateControls() {
     m_speed = new wxChoice(this, 1181);
     m_copiesLabel = new ImLabel(this, 1182, "Burn Copies:");
     m_copies = new wxTextCtrl(this, 1102, wxEmptyString, wxDefaultPosition, wxSize(40, -1));
-    m_spin = new wxSpinButton(this, 1184, wxDefaultPosition, wxDefaultSize, wxSP_VERTICAL);
 
     m_directory->Bind(wxEVT_TEXT, [this](wxCommandEvent&) { UpdateDirectoryCopy(); });
     m_directory->Bind(wxEVT_KILL_FOCUS, [this](wxFocusEvent& event) {
@@ -100,6 +97,20 @@ void COutputPanelWnd::CreateControls() {
     });
     m_browse->Bind(wxEVT_BUTTON, [this](wxCommandEvent&) { Browse(); });
     m_open->Bind(wxEVT_BUTTON, [this](wxCommandEvent&) { OpenFolder(); });
+}
+
+void COutputPanelWnd::MakeCopiesSpin() {
+    // GTK's spin button is among the dearest controls to make, and only the burn mode shows
+    // it: made when that mode is first laid out.
+    if (m_spin != nullptr) {
+        return;
+    }
+    m_spin = new wxSpinButton(this, 1184, wxDefaultPosition, wxDefaultSize, wxSP_VERTICAL);
+    FollowSkinColours(m_spin);
+    m_spin->SetRange(kCopiesMin, kCopiesMax);
+    long copies = kCopiesMin;
+    m_copies->GetValue().ToLong(&copies);
+    m_spin->SetValue(std::clamp(static_cast<int>(copies), kCopiesMin, kCopiesMax));
     m_spin->Bind(wxEVT_SPIN, [this](wxSpinEvent& event) {
         m_copies->ChangeValue(std::to_string(event.GetPosition()));
     });
@@ -242,14 +253,17 @@ bool COutputPanelWnd::OnSkinChanged(const std::string& skinDir) {
 
 void COutputPanelWnd::RecalcLayout() {
     ImSkinDialog::RecalcLayout();
-    if (m_spin == nullptr) {
+    if (m_copies == nullptr) {
         return;
+    }
+    const bool burn = m_showType == 2;
+    if (burn) {
+        MakeCopiesSpin();
     }
     const wxSize client = GetClientSize();
     const int height = m_rowHeight;
     const wxRect row(m_metrics.LeftMargin, std::max(0, (client.y - height) / 2),
                      std::max(0, client.x - m_metrics.LeftMargin - m_metrics.RightMargin), height);
-    const bool burn = m_showType == 2;
     for (wxWindow* w : {static_cast<wxWindow*>(m_destinationLabel), static_cast<wxWindow*>(m_directory),
                         static_cast<wxWindow*>(m_browse), static_cast<wxWindow*>(m_open)}) {
         w->Show(!burn);
@@ -258,7 +272,9 @@ void COutputPanelWnd::RecalcLayout() {
                         static_cast<wxWindow*>(m_speedLabel), static_cast<wxWindow*>(m_speed),
                         static_cast<wxWindow*>(m_copiesLabel), static_cast<wxWindow*>(m_copies),
                         static_cast<wxWindow*>(m_spin)}) {
-        w->Show(burn);
+        if (w != nullptr) {
+            w->Show(burn);
+        }
     }
     for (ImLabel* label : {m_destinationLabel, m_recorderLabel, m_speedLabel, m_copiesLabel}) {
         FitLabel(label);

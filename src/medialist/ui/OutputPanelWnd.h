@@ -57,6 +57,7 @@ public:
 
 private:
     void CreateControls();
+    void MakeCopiesSpin();
     void ShowModeFolder();
     void UpdateDirectoryCopy();
     static const char* FolderKey(int mode);
@@ -71,7 +72,7 @@ private:
     wxChoice* m_speed = nullptr;
     ImLabel* m_copiesLabel = nullptr;
     wxTextCtrl* m_copies = nullptr;
-    wxSpinButton* m_spin = nullptr;
+    wxSpinButton* m_spin = nullptr;  // made with the burn mode's first layout
 
     int m_showType = 0;
     int m_rowHeight = 0;
