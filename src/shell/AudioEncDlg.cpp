@@ -186,6 +186,12 @@ void CAudioEncDlg::CreatePanels() {
     player->SetModeList(2, &BurnPreviewList());
     m_panels[Player] = player;
     m_panels[Rip] = new CDRipDlg(this, platform::MakeDiscDevice());
+    // The rip and burn panels are dressed in the skin when their tab first shows them.
+    for (Panel index : {Rip, Creator}) {
+        ImSkinPanel* panel = m_panels[index];
+        panel->DeferSkinWhileHidden();
+        panel->Hide();
+    }
     m_panels[Player]->SetSize(-1, kPlayerHeight);
     new CFileInfoWnd(this);  // hidden until Show File Information; goes with this window
 }
@@ -204,6 +210,9 @@ void CAudioEncDlg::ShowModePanel(int mode) {
     m_panels[MediaList]->Show(mode == 0);
     m_panels[Rip]->Show(mode == 1);
     m_panels[Creator]->Show(mode == 2);
+    if (mode != 0) {
+        g_Skin.TakeDeferredSkin(m_panels[mode == 1 ? Rip : Creator]);
+    }
     m_check->ShowMode(mode);
     if (g_RipDlg != nullptr && mode == 1) {
         g_RipDlg->OnShowPanel();

@@ -114,9 +114,14 @@ class ImSkinPanel : public wxPanel, public ImSkinDialog {
 public:
     ImSkinPanel(wxWindow* parent, int id, const char* section, int dialogId = 0);
     const char* GetSkinSection() const override { return m_section.c_str(); }
+    // A work mode's panel behind another tab: it takes a skin when it is next shown (the
+    // owner calls g_Skin.TakeDeferredSkin then), so the start does not dress hidden panels.
+    void DeferSkinWhileHidden() { m_deferSkin = true; }
+    bool DefersSkin() const override { return m_deferSkin && !IsShown(); }
 
 private:
     std::string m_section;
+    bool m_deferSkin = false;
 };
 
 // The top-level skinned window: no system frame, shaped corners, a status strip, and the place

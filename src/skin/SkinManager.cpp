@@ -44,11 +44,26 @@ bool ImSkinManager::SetSkin(std::string_view nameOrPath) {
         return false;
     }
     for (ImSkinListener* listener : m_listeners) {
+        if (listener->DefersSkin()) {
+            if (std::find(m_deferred.begin(), m_deferred.end(), listener) == m_deferred.end()) {
+                m_deferred.push_back(listener);
+            }
+            continue;
+        }
         if (!listener->OnSkinChanged(m_strSkinDir)) {
             return false;
         }
     }
     return true;
+}
+
+void ImSkinManager::TakeDeferredSkin(ImSkinListener* listener) {
+    const auto found = std::find(m_deferred.begin(), m_deferred.end(), listener);
+    if (found == m_deferred.end()) {
+        return;
+    }
+    m_deferred.erase(found);
+    listener->OnSkinChanged(m_strSkinDir);
 }
 
 std::string ImSkinManager::GetImagePath(const ImLanguage* language,
@@ -97,6 +112,7 @@ void ImSkinManager::Reset() {
     m_strSkinDir.clear();
     m_strSkinName.clear();
     m_listeners.clear();
+    m_deferred.clear();
 }
 
 }  // namespace ac

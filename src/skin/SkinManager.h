@@ -16,6 +16,9 @@ public:
     virtual ~ImSkinListener() = default;
     // True when the window took the skin; false stops the round of notices.
     virtual bool OnSkinChanged(const std::string& skinDir) = 0;
+    // True while the window is out of sight and would rather take the skin when it comes into
+    // sight (ImSkinManager::TakeDeferredSkin): a work mode's panel behind another tab.
+    virtual bool DefersSkin() const { return false; }
 };
 
 class ImSkinManager {
@@ -30,6 +33,8 @@ public:
     std::string GetImagePath(const class ImLanguage* language, std::string_view fileName) const;
 
     bool AddListener(ImSkinListener* listener);
+    // Hands a listener the skin it put off while out of sight; nothing when it put off none.
+    void TakeDeferredSkin(ImSkinListener* listener);
     void SetRoot(std::string root) { m_strRoot = std::move(root); }
     const std::string& GetRoot() const { return m_strRoot; }
 
@@ -45,6 +50,7 @@ private:
     std::string m_strSkinDir;
     std::string m_strSkinName;
     std::vector<ImSkinListener*> m_listeners;
+    std::vector<ImSkinListener*> m_deferred;  // compared, never called, until taken
 };
 
 // The last component of a skin path, whichever separator it uses.

@@ -17,6 +17,8 @@ public:
         m_log.push_back(m_name + ":" + dir);
         return m_accept;
     }
+    bool DefersSkin() const override { return hidden; }
+    bool hidden = false;
 
 private:
     std::vector<std::string>& m_log;
@@ -126,6 +128,28 @@ TEST_F(SkinCatalogueTest, ARefusingListenerStopsTheRound) {
     EXPECT_FALSE(g_Skin.SetSkin("Default"));
     EXPECT_EQ(log.size(), 1u);
     EXPECT_EQ(g_Skin.GetSkinName(), "Default") << "the names move on even so";
+}
+
+// A panel out of sight takes the skin when shown, and then only the latest one, once.
+TEST_F(SkinCatalogueTest, AHiddenListenerTakesTheLatestSkinWhenShown) {
+    std::vector<std::string> log;
+    Recorder shown(log, "shown");
+    Recorder hidden(log, "hidden");
+    hidden.hidden = true;
+    g_Skin.AddListener(&shown);
+    g_Skin.AddListener(&hidden);
+    ASSERT_TRUE(g_Skin.SetSkin("Default"));
+    ASSERT_TRUE(g_Skin.SetSkin("Blue"));
+    const std::string blue = Logical("Skin\\Blue");
+    EXPECT_EQ(log, (std::vector<std::string>{"shown:" + Logical("Skin\\Default"), "shown:" + blue}));
+    log.clear();
+    hidden.hidden = false;
+    g_Skin.TakeDeferredSkin(&hidden);
+    g_Skin.TakeDeferredSkin(&hidden);
+    g_Skin.TakeDeferredSkin(&shown);
+    EXPECT_EQ(log, std::vector<std::string>{"hidden:" + blue});
+    ASSERT_TRUE(g_Skin.SetSkin("Default"));
+    EXPECT_EQ(log.size(), 3u) << "a shown listener hears every change again";
 }
 
 TEST_F(SkinCatalogueTest, StartChoiceFallsBackToDefaultThenToAnyTakingSkin) {
