@@ -306,20 +306,33 @@ TEST_F(BurnDriverTest, LowDiskDuringConversionStopsTheRun) {
     EXPECT_TRUE(TemporaryFolderEmpty());
 }
 
+// A tmpfs of 256 KiB under the test's folder as the temporary folder, unmounted at the end of
+// the test; false (errno set) where mounting is not allowed.
+class FullDiskTest : public BurnDriverTest {
+protected:
+    bool UseSmallTemporaryFileSystem() {
+        const std::string small = dir / "small";
+        fs::create_directories(small);
+        if (::mount("tmpfs", small.c_str(), "tmpfs", MS_NOSUID | MS_NODEV, "size=256k") != 0)
+            return false;
+        m_mounted = small;
+        temporary = small + "/burntemp";
+        settings.temporaryFolder = temporary;
+        return true;
+    }
+    void TearDown() override {
+        if (!m_mounted.empty())
+            ::umount2(m_mounted.c_str(), MNT_DETACH);
+    }
+    std::string m_mounted;
+};
+
 // A real file system that runs full: a tmpfs of 256 KiB the test mounts (root only; skipped
 // where mounting is not allowed). The tool's writes fail and the disk check trips; either way
 // the run ends with the disk-full message, writes nothing, and leaves no file behind.
-TEST_F(BurnDriverTest, TemporaryFolderOnAFullFileSystemStopsAndLeavesNothing) {
-    const std::string small = dir / "small";
-    fs::create_directories(small);
-    if (::mount("tmpfs", small.c_str(), "tmpfs", MS_NOSUID | MS_NODEV, "size=256k") != 0)
+TEST_F(FullDiskTest, TemporaryFolderOnAFullFileSystemStopsAndLeavesNothing) {
+    if (!UseSmallTemporaryFileSystem())
         GTEST_SKIP() << "cannot mount a tmpfs here: " << std::strerror(errno);
-    struct Unmount {
-        std::string path;
-        ~Unmount() { ::umount2(path.c_str(), MNT_DETACH); }
-    } unmount{small};
-    temporary = small + "/burntemp";
-    settings.temporaryFolder = temporary;
     const std::string first = AddWav("slow one.wav", 44100);
     AddWav("two.wav", 44100);
     AddWav("three.wav", 44100);
@@ -334,17 +347,9 @@ TEST_F(BurnDriverTest, TemporaryFolderOnAFullFileSystemStopsAndLeavesNothing) {
 
 // The same full file system with a disk check that sees room: the tool's failed writes fail
 // their rows, the rows that fit are burnt, and the pieces of the others are gone.
-TEST_F(BurnDriverTest, RowsWhoseWavDoesNotFitFailAndTheRestAreBurnt) {
-    const std::string small = dir / "small";
-    fs::create_directories(small);
-    if (::mount("tmpfs", small.c_str(), "tmpfs", MS_NOSUID | MS_NODEV, "size=256k") != 0)
+TEST_F(FullDiskTest, RowsWhoseWavDoesNotFitFailAndTheRestAreBurnt) {
+    if (!UseSmallTemporaryFileSystem())
         GTEST_SKIP() << "cannot mount a tmpfs here: " << std::strerror(errno);
-    struct Unmount {
-        std::string path;
-        ~Unmount() { ::umount2(path.c_str(), MNT_DETACH); }
-    } unmount{small};
-    temporary = small + "/burntemp";
-    settings.temporaryFolder = temporary;
     settings.maxProcesses = 1;  // one worker, in order: the first fits, the next two do not
     settings.maxRunningProcesses = 1;
     driver->SetFreeSpaceProbe([](const std::string&) { return std::uint64_t{1} << 40; });
