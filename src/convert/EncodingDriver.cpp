@@ -383,11 +383,16 @@ void EncodingDriver::PauseSelected() {
 }
 
 void EncodingDriver::StopRows(RowSet set) {
-    std::vector<CEncodeProcess*> asked;
+    // Every row's status moves first, and only then are the children asked to end: a child
+    // that ended at once would otherwise free its place for a waiting row of the same set,
+    // which the driver thread could start before this loop reached it (a run the user had
+    // just stopped went on, and its end started the after-run action).
+    std::vector<int> rows;
     for (int row = 0; row < m_list.GetRowCount(); ++row) {
         MediaItem* item = m_list.GetItem(row);
         if (!item || !InSet(set, row))
             continue;
+        rows.push_back(row);
         JobStatus status = item->Status();
         if (status == JobStatus::Running)
             Move(*item, status, JobStatus::Aborted);
@@ -395,8 +400,12 @@ void EncodingDriver::StopRows(RowSet set) {
             Move(*item, status, JobStatus::AbortedSuspended);
         else if (status == JobStatus::Waiting)
             Move(*item, status, JobStatus::Idle);
-        // The counters follow when the exit arrives, through OnProcessExit.
-        CEncodeProcess* child = item->process.load();
+    }
+    // The counters follow when the exit arrives, through OnProcessExit.
+    std::vector<CEncodeProcess*> asked;
+    for (int row : rows) {
+        MediaItem* item = m_list.GetItem(row);
+        CEncodeProcess* child = item != nullptr ? item->process.load() : nullptr;
         if (child && child->IsRunning()) {
             child->RequestStop(kStoppedExitCode);
             asked.push_back(child);
