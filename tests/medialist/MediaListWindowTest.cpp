@@ -2,6 +2,7 @@
 // files, folders and cue sheets, the check boxes, the commands' rules, profiles, and the list
 // as the driver's thread sees it. Runs under xvfb-run.
 
+#include "../support/QuietHub.h"
 #include "../support/WxTestApp.h"
 #include "medialist/ui/MediaListWnd.h"
 #include "medialist/ui/OutputPanelWnd.h"
@@ -38,9 +39,8 @@ namespace {
 
 namespace fs = std::filesystem;
 
-class FakeHub : public IMainHub {
+class FakeHub : public test::QuietHub {
 public:
-    int WorkMode() override { return 0; }
     void PostCommand(int id) override { posted.push_back(id); }
     bool IsCommandEnabled(int) override { return commandsEnabled; }
     void ShowContextMenu(wxWindow*, int id) override { menus.push_back(id); }
@@ -48,17 +48,6 @@ public:
     void SetStatusText(const std::string& text) override { statusTexts.push_back(text); }
     void SetBitRateAllowed(bool allowed) override { bitRate.push_back(allowed); }
     void ShowFileInfo(MediaItem* item) override { fileInfo.push_back(item); }
-    void ApplyProfile(Profile&) override {}
-    void OnProfileChosen(int) override {}
-    void OnCatalogueLoaded() override {}
-    std::vector<ParameterSet*> SelectedSets() override { return {}; }
-    void EditSets(const std::function<void()>& edit) override { edit(); }
-    void SetSelectedVolume(int, bool) override {}
-    int RememberedProfileIndex(int) override { return 0; }
-    void RememberProfileIndex(int, int) override {}
-    bool IsConvertRunActive() override { return false; }
-    double RunDoneSeconds() override { return 0; }
-    double RunTotalSeconds() override { return 0; }
 
     bool commandsEnabled = true;
     std::vector<int> posted, menus, selections;

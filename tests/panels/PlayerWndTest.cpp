@@ -9,6 +9,7 @@
 
 #include "../support/AudioFixtures.h"
 #include "../support/DiscImages.h"
+#include "../support/QuietHub.h"
 
 #include <wx/frame.h>
 
@@ -20,30 +21,7 @@ namespace {
 
 using namespace std::chrono_literals;
 
-class ModeHub : public IMainHub {
-public:
-    int WorkMode() override { return mode; }
-    void PostCommand(int) override {}
-    bool IsCommandEnabled(int) override { return true; }
-    void ShowContextMenu(wxWindow*, int) override {}
-    void OnListSelectionChanged(int) override {}
-    void SetStatusText(const std::string&) override {}
-    void SetBitRateAllowed(bool) override {}
-    void ShowFileInfo(MediaItem*) override {}
-    void ApplyProfile(Profile&) override {}
-    void OnProfileChosen(int) override {}
-    void OnCatalogueLoaded() override {}
-    std::vector<ParameterSet*> SelectedSets() override { return {}; }
-    void EditSets(const std::function<void()>& edit) override { edit(); }
-    void SetSelectedVolume(int, bool) override {}
-    int RememberedProfileIndex(int) override { return 0; }
-    void RememberProfileIndex(int, int) override {}
-    bool IsConvertRunActive() override { return false; }
-    double RunDoneSeconds() override { return 0; }
-    double RunTotalSeconds() override { return 0; }
-
-    int mode = 0;
-};
+using ModeHub = test::QuietHub;
 
 // A list with one selected row at most, as the panels' single clicks leave them.
 class FakeList : public IPreviewList {

@@ -10,6 +10,8 @@
 #include "shell/AppConfig.h"
 #include "shell/MainHub.h"
 
+#include "../support/QuietHub.h"
+
 #include <wx/frame.h>
 #include <wx/textctrl.h>
 
@@ -18,34 +20,17 @@
 namespace ac {
 namespace {
 
-class FakeHub : public IMainHub {
+class FakeHub : public test::QuietHub {
 public:
-    int WorkMode() override { return mode; }
-    void PostCommand(int) override {}
-    bool IsCommandEnabled(int) override { return true; }
-    void ShowContextMenu(wxWindow*, int) override {}
-    void OnListSelectionChanged(int) override {}
-    void SetStatusText(const std::string&) override {}
-    void SetBitRateAllowed(bool) override {}
-    void ShowFileInfo(MediaItem*) override {}
-    void ApplyProfile(Profile&) override {}
-    void OnProfileChosen(int) override {}
-    void OnCatalogueLoaded() override {}
-    std::vector<ParameterSet*> SelectedSets() override { return {}; }
-    void EditSets(const std::function<void()>& edit) override { edit(); }
-    void SetSelectedVolume(int, bool) override {}
-    int RememberedProfileIndex(int) override { return 0; }
-    void RememberProfileIndex(int, int) override {}
     bool IsConvertRunActive() override { return running; }
     double RunDoneSeconds() override { return done; }
-    std::string RunProgressText() override { return progressText; }
-    std::string progressText;
     double RunTotalSeconds() override { return total; }
+    std::string RunProgressText() override { return progressText; }
 
-    int mode = 0;
     bool running = false;
     double done = 0;
     double total = 0;
+    std::string progressText;
 };
 
 class StatusWndTest : public ::testing::Test {

@@ -30,13 +30,8 @@ namespace {
 constexpr int kListId = 1001;
 constexpr int kTimerId = 1;
 
-struct ButtonDef {
-    int id;
-    const char* text;
-    const char* picture;
-};
 // Left to right as they stand in the row.
-constexpr std::array<ButtonDef, 7> kButtons = {{{1002, "Add", "Add.png"},
+constexpr std::array<IconButtonDef, 7> kButtons = {{{1002, "Add", "Add.png"},
                                                 {1003, "Remove", "Remove.png"},
                                                 {1004, "Clear", "Clear.png"},
                                                 {1135, "Burn", "Burn.png"},

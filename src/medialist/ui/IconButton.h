@@ -10,6 +10,13 @@
 
 namespace ac {
 
+// One button of a work mode's button row: its control id, built-in word and skin picture.
+struct IconButtonDef {
+    int id;
+    const char* text;
+    const char* picture;
+};
+
 // Sizes a button for its picture and label; without a picture, for the label alone.
 inline void FitIconButton(ImButton& button, int minimumHeight) {
     const wxSize fit = button.FitSize();

@@ -23,13 +23,8 @@ namespace ac {
 namespace {
 
 constexpr int kListId = 1001;
-struct ButtonDef {
-    int id;
-    const char* text;
-    const char* picture;
-};
 // Left to right as they stand in the row.
-constexpr std::array<ButtonDef, 6> kButtons = {{{1002, "Add", "add.png"},
+constexpr std::array<IconButtonDef, 6> kButtons = {{{1002, "Add", "add.png"},
                                                 {1003, "Remove", "remove.png"},
                                                 {1004, "Clear", "clear.png"},
                                                 {1034, "Encode", "encode.png"},

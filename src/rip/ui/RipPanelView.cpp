@@ -46,12 +46,7 @@ constexpr std::array<BoxDef, 4> kBoxes = {{{1069, "Artist:", 1070},
                                            {1072, "Genre:", 1085},
                                            {1073, "Year:", 1076}}};
 
-struct ButtonDef {
-    int id;
-    const char* text;
-    const char* picture;
-};
-constexpr std::array<ButtonDef, 4> kRunButtons = {{{1077, "CDDB", "freedb.png"},
+constexpr std::array<IconButtonDef, 4> kRunButtons = {{{1077, "CDDB", "freedb.png"},
                                                    {1080, "Rip", "Rip.png"},
                                                    {1081, "Pause", "Pause.png"},
                                                    {1082, "Stop", "Stop.png"}}};

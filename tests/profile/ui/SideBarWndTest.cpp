@@ -1,6 +1,7 @@
 // The side bar on a real window with a fake main dialog: the catalogue loads from a data.pkg of
 // a test's own, user profiles saved, renamed and deleted survive a restart of the panel, and
 // edits in the grid and on the simple controls reach every set handed in. Runs under xvfb-run.
+#include "../../support/QuietHub.h"
 #include "../../support/WxTestApp.h"
 #include "profile/ui/SideBarWnd.h"
 
@@ -35,16 +36,8 @@ const std::vector<std::string> kEntries = {
     "ar = 0, \"\", \"44100\"", "ac = 0, \"\", \"2 (Stereo)\"",
     "vol_factor = 0, \"100%\", \"100%\""};
 
-class FakeHub : public IMainHub {
+class FakeHub : public test::QuietHub {
 public:
-    int WorkMode() override { return mode; }
-    void PostCommand(int) override {}
-    bool IsCommandEnabled(int) override { return true; }
-    void ShowContextMenu(wxWindow*, int) override {}
-    void OnListSelectionChanged(int) override {}
-    void SetStatusText(const std::string&) override {}
-    void SetBitRateAllowed(bool) override {}
-    void ShowFileInfo(MediaItem*) override {}
     void ApplyProfile(Profile& profile) override {
         applied.push_back(profile.GetName());
         if (g_SideBar != nullptr) {
@@ -62,16 +55,11 @@ public:
     void SetSelectedVolume(int volume, bool firstOnly) override {
         volumes.emplace_back(volume, firstOnly);
     }
-    int RememberedProfileIndex(int) override { return 0; }
     void RememberProfileIndex(int workMode, int index) override {
         remembered.emplace_back(workMode, index);
     }
-    bool IsConvertRunActive() override { return false; }
-    double RunDoneSeconds() override { return 0; }
-    double RunTotalSeconds() override { return 0; }
     bool IsBurnRunActive() override { return burning; }
 
-    int mode = 0;
     bool burning = false;
     std::vector<ParameterSet*> selected;
     std::vector<std::string> applied;
