@@ -506,8 +506,8 @@ void CPlayerWnd::OnLanguageChanged() {
     m_stop->SetToolTip(Text(kStopTip));
 }
 
-void CPlayerWnd::RecalcLayout() {
-    ImSkinDialog::RecalcLayout();
+void CPlayerWnd::DoRecalcLayout() {
+    ImSkinDialog::DoRecalcLayout();
     if (m_play == nullptr) {
         return;
     }

@@ -119,7 +119,7 @@ public:
     std::string DescribeState() const;
 
     void OnLanguageChanged() override;
-    void RecalcLayout() override;
+    void DoRecalcLayout() override;
     bool OnSkinChanged(const std::string& skinDir) override;
 
 private:

@@ -221,8 +221,8 @@ void CStatusWnd::OnLanguageChanged() {
     m_logWnd->OnLanguageChanged();
 }
 
-void CStatusWnd::RecalcLayout() {
-    ImSkinDialog::RecalcLayout();
+void CStatusWnd::DoRecalcLayout() {
+    ImSkinDialog::DoRecalcLayout();
     if (m_bar == nullptr || m_logButton == nullptr) {
         return;
     }

@@ -59,7 +59,7 @@ public:
     void Append(const std::string& text, LogLineKind kind) override;
 
     void OnLanguageChanged() override;
-    void RecalcLayout() override;
+    void DoRecalcLayout() override;
     bool OnSkinChanged(const std::string& skinDir) override;
 
 private:

@@ -227,6 +227,15 @@ std::string SettingsStore::TakeSetAsideNotice() {
 }
 
 void SettingsStore::LoadLocked() {
+    if (ReloadLocked()) {
+        for (const Held& held : m_held) {
+            ApplyLocked(held.key, held.name, held.value);
+        }
+    }
+}
+
+// True when the lines were read anew (or emptied), false when memory already matched the file.
+bool SettingsStore::ReloadLocked() {
     struct stat st {};
     FileIdentity identity;
     if (::stat(m_filePath.c_str(), &st) == 0) {
@@ -236,7 +245,7 @@ void SettingsStore::LoadLocked() {
                     static_cast<long long>(st.st_mtim.tv_sec) * 1000000000LL + st.st_mtim.tv_nsec};
     }
     if (m_loadedIdentity && *m_loadedIdentity == identity) {
-        return;
+        return false;
     }
     m_lines.clear();
     m_loadedIdentity.reset();
@@ -245,10 +254,10 @@ void SettingsStore::LoadLocked() {
     ReadResult result = ReadWholeFile(m_filePath, contents, kMaxFileSize);
     if (result == ReadResult::Missing) {
         m_loadedIdentity = identity;
-        return;
+        return true;
     }
     if (result == ReadResult::Failed) {
-        return;  // unreadable for now (permissions, a directory): defaults, try again later
+        return true;  // unreadable for now (permissions, a directory): defaults, try again later
     }
     if (contents.substr(0, 3) == "\xEF\xBB\xBF") {
         contents.erase(0, 3);
@@ -257,7 +266,7 @@ void SettingsStore::LoadLocked() {
         !IsValidUtf8(contents)) {
         m_setAsideNotice = SetAsideDamagedFile(m_filePath);
         m_loadedIdentity = FileIdentity{};
-        return;
+        return true;
     }
 
     std::string section;
@@ -289,6 +298,7 @@ void SettingsStore::LoadLocked() {
         m_lines.push_back(std::move(line));
     }
     m_loadedIdentity = identity;
+    return true;
 }
 
 std::optional<SettingValue> SettingsStore::Read(std::string_view key, std::string_view name) {
@@ -325,17 +335,19 @@ bool SettingsStore::Write(std::string_view key, std::string_view name, const Set
         return false;
     }
     std::lock_guard lock(m_mutex);
-    std::string directory = m_filePath.substr(0, m_filePath.find_last_of('/'));
-    if (!EnsureDirectory(directory)) {
-        return false;
-    }
-    FileLock fileLock(m_filePath + ".lock");
-    if (!m_sweptTemporaries) {
-        RemoveStaleTemporaries(m_filePath);
-        m_sweptTemporaries = true;
-    }
     LoadLocked();
+    ApplyLocked(key, name, value);
+    m_held.push_back({std::string(key), std::string(name), value});
+    if (m_holds > 0) {
+        return true;
+    }
+    const bool written = WriteFileLocked();
+    m_held.clear();
+    return written;
+}
 
+void SettingsStore::ApplyLocked(std::string_view key, std::string_view name,
+                                const SettingValue& value) {
     Line entry;
     entry.section = std::string(key);
     entry.name = std::string(name);
@@ -349,32 +361,63 @@ bool SettingsStore::Write(std::string_view key, std::string_view name, const Set
         entry.name = existing->name;
         entry.section = existing->section;
         *existing = std::move(entry);
-    } else {
-        // Behind the last line of the section, or a new section at the end.
-        auto last = m_lines.end();
-        for (auto it = m_lines.begin(); it != m_lines.end(); ++it) {
-            if (EqualsNoCase(it->section, key) && (it->isHeader || !it->name.empty())) {
-                last = it;
-            }
-        }
-        if (last == m_lines.end()) {
-            Line header;
-            header.isHeader = true;
-            header.section = std::string(key);
-            m_lines.push_back(std::move(header));
-            m_lines.push_back(std::move(entry));
-        } else {
-            entry.section = last->section;
-            m_lines.insert(last + 1, std::move(entry));
+        return;
+    }
+    // Behind the last line of the section, or a new section at the end.
+    auto last = m_lines.end();
+    for (auto it = m_lines.begin(); it != m_lines.end(); ++it) {
+        if (EqualsNoCase(it->section, key) && (it->isHeader || !it->name.empty())) {
+            last = it;
         }
     }
+    if (last == m_lines.end()) {
+        Line header;
+        header.isHeader = true;
+        header.section = std::string(key);
+        m_lines.push_back(std::move(header));
+        m_lines.push_back(std::move(entry));
+    } else {
+        entry.section = last->section;
+        m_lines.insert(last + 1, std::move(entry));
+    }
+}
 
+// Lays the held values over the file. Called with the mutex held.
+bool SettingsStore::WriteFileLocked() {
+    std::string directory = m_filePath.substr(0, m_filePath.find_last_of('/'));
+    if (!EnsureDirectory(directory)) {
+        m_loadedIdentity.reset();  // memory holds what the file does not: read it again
+        return false;
+    }
+    FileLock fileLock(m_filePath + ".lock");
+    if (!m_sweptTemporaries) {
+        RemoveStaleTemporaries(m_filePath);
+        m_sweptTemporaries = true;
+    }
+    // Another program may have written since the lines were loaded: their values stay and
+    // ours go over them.
+    LoadLocked();
     bool written = WriteFileAtomically(m_filePath, Serialise());
     // Memory now matches the file only if the write went through; otherwise reload next time.
     m_loadedIdentity.reset();
     if (written) {
         LoadLocked();
     }
+    return written;
+}
+
+void SettingsStore::HoldWrites() {
+    std::lock_guard lock(m_mutex);
+    ++m_holds;
+}
+
+bool SettingsStore::ReleaseWrites() {
+    std::lock_guard lock(m_mutex);
+    if (m_holds == 0 || --m_holds > 0 || m_held.empty()) {
+        return true;
+    }
+    const bool written = WriteFileLocked();
+    m_held.clear();
     return written;
 }
 

@@ -46,6 +46,12 @@ public:
     // Where a damaged file was moved on the last load, for a one-time notice; empty if none.
     std::string TakeSetAsideNotice();
 
+    // While held, writes change what reads return but reach the file at the last release, in
+    // one replacement of the file. Writes of another program meanwhile are kept: the release
+    // lays the held values over the file as it is then. Nests.
+    void HoldWrites();
+    bool ReleaseWrites();
+
 private:
     struct Line {
         std::string raw;      // the line as read, for lines kept verbatim
@@ -60,8 +66,16 @@ private:
         bool operator==(const FileIdentity&) const = default;
     };
 
+    struct Held {
+        std::string key, name;
+        SettingValue value;
+    };
+
     void LoadLocked();
+    bool ReloadLocked();
     bool Write(std::string_view key, std::string_view name, const SettingValue& value);
+    void ApplyLocked(std::string_view key, std::string_view name, const SettingValue& value);
+    bool WriteFileLocked();
     std::string Serialise() const;
 
     std::string m_filePath;
@@ -70,6 +84,8 @@ private:
     std::optional<FileIdentity> m_loadedIdentity;
     std::string m_setAsideNotice;
     bool m_sweptTemporaries = false;
+    int m_holds = 0;
+    std::vector<Held> m_held;
 };
 
 // Text form of values in the file; exposed for tests and the fuzzer.

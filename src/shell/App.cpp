@@ -18,6 +18,7 @@
 #include <cstring>
 #include <memory>
 #include <string>
+#include <utility>
 #include <sys/stat.h>
 #include <unistd.h>
 #include <vector>
@@ -100,6 +101,11 @@ public:
     bool OnInit() override {
         s_defaultAssertHandler = wxSetAssertHandler(IgnoreMenuIdAssert);
         ac::AppConfig& config = ac::GetAppConfig();
+        // The first start creates some thirty keys, each of which would replace and sync the
+        // settings file before the window shows: they reach the file in one write once the
+        // window has painted (or when a start that shows no window ends).
+        config.HoldWrites();
+        m_writesHeld = true;
         const ac::ProductStrings& product = config.GetProductStrings();
         SetAppDisplayName(wxString::FromUTF8(product.productName));
         ChooseLanguage(config);
@@ -110,6 +116,7 @@ public:
         m_instance = std::make_unique<wxSingleInstanceChecker>();
         const std::string socketPath = ac::platform::InstanceSocketPath();
         if (!m_instance->Create("cd-burner", wxString::FromUTF8(lockDir))) {
+            ReleaseSettingsWrites();
             return false;
         }
         if (m_instance->IsAnotherRunning()) {
@@ -119,6 +126,7 @@ public:
                              "audio-converter: another copy is running but did not take "
                              "the files\n");
             }
+            ReleaseSettingsWrites();
             return false;
         }
 
@@ -133,6 +141,7 @@ public:
         SetTopWindow(dialog);
         dialog->OnInitDialog();
         dialog->Show();
+        dialog->AfterFirstPaint([this] { ReleaseSettingsWrites(); });
         ac::StartTestHook(dialog);
         dialog->OpenFiles(g_openPaths);
         m_listener.Start(socketPath, [dialog](std::vector<std::string> paths) {
@@ -147,12 +156,20 @@ public:
     }
 
     int OnExit() override {
+        ReleaseSettingsWrites();
         m_listener.Stop();
         m_instance.reset();
         return wxApp::OnExit();
     }
 
 private:
+    void ReleaseSettingsWrites() {
+        if (std::exchange(m_writesHeld, false)) {
+            ac::GetAppConfig().ReleaseWrites();
+        }
+    }
+
+    bool m_writesHeld = false;
     std::unique_ptr<wxSingleInstanceChecker> m_instance;
     ac::platform::InstanceListener m_listener;
 };

@@ -68,6 +68,10 @@ public:
     std::string GetString(const char* name);
     static std::string DefaultString(const char* name);
 
+    // Writes wait in memory between these, for the start of the window (SettingsStore).
+    void HoldWrites() { m_store.HoldWrites(); }
+    bool ReleaseWrites() { return m_store.ReleaseWrites(); }
+
     // Where a damaged settings file was moved at loading, once; empty if none.
     std::string TakeSetAsideNotice() { return m_store.TakeSetAsideNotice(); }
 

@@ -90,6 +90,9 @@ CAudioEncDlg::CAudioEncDlg()
     Bind(wxEVT_PAINT, [this](wxPaintEvent& event) {
         if (m_firstPaintMs == 0) {
             m_firstPaintMs = wxGetUTCTimeMillis().GetValue();
+            if (m_afterFirstPaint) {
+                CallAfter(std::exchange(m_afterFirstPaint, nullptr));
+            }
         }
         event.Skip();
     });
@@ -124,6 +127,7 @@ CAudioEncDlg::~CAudioEncDlg() {
 }
 
 void CAudioEncDlg::OnInitDialog() {
+    ImSkinDialog::HoldLayouts();
     InitialPlacement();
     g_MainDlg = this;
     InstallWxUiQueue();
@@ -152,8 +156,7 @@ void CAudioEncDlg::OnInitDialog() {
     if (mode < 0 || mode > 2) {
         mode = 0;
     }
-    m_rip = std::make_unique<CRipMode>(this, *g_RipDlg);
-    m_burn = std::make_unique<CBurnMode>(this, *g_CreatorPanel);
+    EnsureModePanel(mode);  // before the menu: the Rip menu lists the drives
     LoadModeMenu(mode);
     m_convert = std::make_unique<CConvertMode>(this);
     m_convert->SetWorkMode(mode);
@@ -170,13 +173,13 @@ void CAudioEncDlg::OnInitDialog() {
     }
     m_diskTimer.Start(3000);
     RecalcLayout();
+    ImSkinDialog::ReleaseLayouts();
 }
 
 void CAudioEncDlg::CreatePanels() {
     // Order of creation is the order of skin notices.
     m_check = new CCheck(this);
     m_panels[Status] = new CStatusWnd(this);
-    m_panels[Creator] = new CCDCreatorPanel(this);
     m_panels[SideBar] = new CSideBarWnd(this);
     m_panels[MediaList] = new CMediaListWnd(this);
     m_panels[Output] = new COutputPanelWnd(this);
@@ -185,15 +188,41 @@ void CAudioEncDlg::CreatePanels() {
     player->SetModeList(1, &RipPreviewList());
     player->SetModeList(2, &BurnPreviewList());
     m_panels[Player] = player;
-    m_panels[Rip] = new CDRipDlg(this, platform::MakeDiscDevice());
-    // The rip and burn panels are dressed in the skin when their tab first shows them.
-    for (Panel index : {Rip, Creator}) {
-        ImSkinPanel* panel = m_panels[index];
-        panel->DeferSkinWhileHidden();
-        panel->Hide();
-    }
     m_panels[Player]->SetSize(-1, kPlayerHeight);
-    new CFileInfoWnd(this);  // hidden until Show File Information; goes with this window
+    // The rip and burn panels and the file information window are made when first needed.
+}
+
+// A fifth of the start went into the panels of the two tabs most starts never open, their
+// drive and recorder scans included.
+void CAudioEncDlg::EnsureModePanel(int mode) {
+    ImSkinPanel* made = nullptr;
+    if (mode == 1 && m_panels[Rip] == nullptr) {
+        auto* rip = new CDRipDlg(this, platform::MakeDiscDevice());
+        m_panels[Rip] = made = rip;
+        m_rip = std::make_unique<CRipMode>(this, *rip);
+        m_rip->SetAfterRunAction(m_afterConvert);
+    } else if (mode == 2 && m_panels[Creator] == nullptr) {
+        auto* creator = new CCDCreatorPanel(this);
+        m_panels[Creator] = made = creator;
+        m_burn = std::make_unique<CBurnMode>(this, *creator);
+        m_burn->SetAfterRunAction(m_afterConvert);
+    }
+    if (made == nullptr) {
+        return;
+    }
+    // Behind another tab the panel takes a change of skin when it shows again.
+    made->Hide();
+    made->DeferSkinWhileHidden();
+    g_Skin.DressLateListener(made);
+    RecalcLayout();
+}
+
+void CAudioEncDlg::EnsureFileInfoWindow() {
+    if (g_FileInfoWnd == nullptr) {
+        new CFileInfoWnd(this);  // goes with this window
+        g_FileInfoWnd->SetItem(m_fileInfo ? &*m_fileInfo : nullptr);
+        m_fileInfo.reset();
+    }
 }
 
 int CAudioEncDlg::GetWorkMode() const {
@@ -207,9 +236,12 @@ void CAudioEncDlg::ShowModePanel(int mode) {
     if (g_RipDlg != nullptr && mode != 1 && g_RipDlg->IsShown()) {
         g_RipDlg->OnHidePanel();
     }
-    m_panels[MediaList]->Show(mode == 0);
-    m_panels[Rip]->Show(mode == 1);
-    m_panels[Creator]->Show(mode == 2);
+    EnsureModePanel(mode);
+    for (Panel list : {MediaList, Rip, Creator}) {
+        if (m_panels[list] != nullptr) {
+            m_panels[list]->Show(list == (mode == 0 ? MediaList : mode == 1 ? Rip : Creator));
+        }
+    }
     if (mode != 0) {
         g_Skin.TakeDeferredSkin(m_panels[mode == 1 ? Rip : Creator]);
     }
@@ -322,7 +354,9 @@ void CAudioEncDlg::OnInitMenuPopup(wxMenu* menu) {
 void CAudioEncDlg::OnLanguageChanged() {
     m_check->OnLanguageChanged();
     for (ImSkinPanel* panel : m_panels) {
-        panel->OnLanguageChanged();
+        if (panel != nullptr) {
+            panel->OnLanguageChanged();
+        }
     }
 }
 
@@ -354,8 +388,8 @@ bool CAudioEncDlg::OnSkinChanged(const std::string& skinDir) {
     return taken;
 }
 
-void CAudioEncDlg::RecalcLayout() {
-    ImSkinFrame::RecalcLayout();
+void CAudioEncDlg::DoRecalcLayout() {
+    ImSkinFrame::DoRecalcLayout();
     if (m_check == nullptr || m_panels[Status] == nullptr) {
         return;
     }
@@ -383,8 +417,10 @@ void CAudioEncDlg::RecalcLayout() {
     const wxRect column(rightX, content.y + gapHeight, rightW,
                         std::max(0, content.height - gapHeight - m_metrics.BottomMargin));
     for (Panel list : {MediaList, Rip, Creator}) {
-        LayoutRow(column, 1, 0, m_panels[list],
-                  {m_panels[list], m_panels[Output], m_panels[Status]});
+        if (m_panels[list] != nullptr) {
+            LayoutRow(column, 1, 0, m_panels[list],
+                      {m_panels[list], m_panels[Output], m_panels[Status]});
+        }
     }
     const wxRect side(left, content.y + 4, sideWidth,
                       std::max(0, content.height - 4 - m_metrics.BottomMargin));
@@ -509,8 +545,9 @@ void CAudioEncDlg::OnCommand(wxCommandEvent& event) {
         return;
     }
     // Show File Information serves every mode: the window shows whatever row it was given.
-    if (id == CFileInfoWnd::kCommandId && g_FileInfoWnd != nullptr) {
+    if (id == CFileInfoWnd::kCommandId) {
         if (IsCommandEnabled(id)) {
+            EnsureFileInfoWindow();
             g_FileInfoWnd->ShowInfo(true);
         }
         return;

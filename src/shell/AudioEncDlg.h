@@ -4,15 +4,18 @@
 //
 // Thread contract: UI thread only. Workers reach it through the UI-thread bridge.
 
+#include "medialist/MediaFileInfo.h"
 #include "shell/MainHub.h"
 #include "skin/SkinDialog.h"
 
 #include <wx/timer.h>
 
 #include <array>
+#include <functional>
 #include <iosfwd>
 #include <map>
 #include <memory>
+#include <optional>
 #include <string>
 #include <vector>
 
@@ -39,7 +42,7 @@ public:
     void OnInitDialog();
 
     void OnLanguageChanged() override;
-    void RecalcLayout() override;
+    void DoRecalcLayout() override;
     const char* GetSkinSection() const override { return "Main"; }
     bool CanResize() const override { return true; }
     void OnLanguageCommand() override;
@@ -54,6 +57,10 @@ public:
     // After the preferences wrote settings: every running copy reads them again.
     void OnPreferencesApplied();
     int GetWorkMode() const;
+    // Runs once from the event loop after the window's first paint.
+    void AfterFirstPaint(std::function<void()> then) { m_afterFirstPaint = std::move(then); }
+    // The rip (1) and burn (2) panels, with their modes, are made when first needed.
+    void EnsureModePanel(int mode);
 
     // IMainHub: how the panels reach each other (AudioEncHub.cpp).
     int WorkMode() override { return GetWorkMode(); }
@@ -89,6 +96,7 @@ private:
     enum Panel { MediaList, Creator, Output, Player, Rip, SideBar, Status, PanelCount };
 
     void CreatePanels();
+    void EnsureFileInfoWindow();
     void LoadModeMenu(int mode);
     void FillSkinMenu(wxMenu& popup);
     void FillLanguageMenu(wxMenu& popup);
@@ -119,6 +127,8 @@ private:
     std::map<int, std::string> m_skinCommands;
     std::map<int, std::string> m_languageCommands;
     std::string m_fileInfoBodyColour;
+    // What the file information window shows, kept until the window is first made.
+    std::optional<MediaFileInfo> m_fileInfo;
     int m_afterConvert = 4;
     // Layout keys of other sections, read at each change of skin.
     int m_sideBarWidth = 200;
@@ -126,6 +136,7 @@ private:
     int m_checkGapHeight = 27;
     // Measured for the benchmarks only.
     long long m_firstPaintMs = 0;
+    std::function<void()> m_afterFirstPaint;
     double m_lastBench = 0;
 };
 

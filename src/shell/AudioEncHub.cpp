@@ -178,6 +178,10 @@ void CAudioEncDlg::SetBitRateAllowed(bool allowed) {
 void CAudioEncDlg::ShowFileInfo(MediaItem* item) {
     if (g_FileInfoWnd != nullptr) {
         g_FileInfoWnd->SetItem(item != nullptr ? &item->info : nullptr);
+    } else if (item != nullptr) {
+        m_fileInfo = item->info;
+    } else {
+        m_fileInfo.reset();
     }
 }
 

@@ -56,8 +56,8 @@ bool CCheck::OnSkinChanged(const std::string& skinDir) {
     return true;
 }
 
-void CCheck::RecalcLayout() {
-    ImSkinDialog::RecalcLayout();
+void CCheck::DoRecalcLayout() {
+    ImSkinDialog::DoRecalcLayout();
     const wxSize client = GetClientSize();
     int x = m_metrics.LeftMargin;
     for (ImButton* tab : m_tabs) {

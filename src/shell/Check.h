@@ -21,7 +21,7 @@ public:
     explicit CCheck(wxWindow* parent);
 
     void OnLanguageChanged() override;
-    void RecalcLayout() override;
+    void DoRecalcLayout() override;
     bool OnSkinChanged(const std::string& skinDir) override;
 
     // Marks mode's tab as the current one.

@@ -60,14 +60,23 @@ public:
         }
         const std::string commands = m_dir + "/command.txt";
         std::ifstream in(commands);
+        std::string text;
         if (in) {
+            std::ostringstream whole;
+            whole << in.rdbuf();
+            text = whole.str();
+            in.close();
+        }
+        // A shell's `echo close > command.txt` creates the file before it writes: a file that
+        // does not end its last line yet is still being written and is read on the next tick.
+        if (!text.empty() && text.back() == '\n') {
+            std::remove(commands.c_str());
+            std::istringstream lineStream(text);
             std::string line;
             std::vector<std::string> lines;
-            while (std::getline(in, line)) {
+            while (std::getline(lineStream, line)) {
                 lines.push_back(line);
             }
-            in.close();
-            std::remove(commands.c_str());
             // Each command runs from the event loop, not from this timer: a command that opens
             // a modal dialog must leave the timer free to deliver the next one to it.
             for (const std::string& command : lines) {
@@ -117,6 +126,12 @@ std::string CTestHook::DescribeState(const CAudioEncDlg& dlg) {
     out << "visible=";
     for (int i = 0; i < CAudioEncDlg::PanelCount; ++i) {
         if (dlg.m_panels[std::size_t(i)] != nullptr && dlg.m_panels[std::size_t(i)]->IsShown()) {
+            out << kNames[i] << ";";
+        }
+    }
+    out << "\nmade=";
+    for (int i = 0; i < CAudioEncDlg::PanelCount; ++i) {
+        if (dlg.m_panels[std::size_t(i)] != nullptr) {
             out << kNames[i] << ";";
         }
     }
@@ -247,8 +262,10 @@ void CTestHook::DescribePanels(const CAudioEncDlg& dlg, std::ostream& out) {
     if (g_PlayerWnd != nullptr) {
         out << g_PlayerWnd->DescribeState();
     }
+    // The window is made the first time it is shown.
+    out << "fileinfo_shown=" << (g_FileInfoWnd != nullptr && g_FileInfoWnd->IsShown() ? 1 : 0)
+        << "\n";
     if (g_FileInfoWnd != nullptr) {
-        out << "fileinfo_shown=" << (g_FileInfoWnd->IsShown() ? 1 : 0) << "\n";
         out << "fileinfo_bytes=" << g_FileInfoWnd->PageText().size() << "\n";
         out << "fileinfo_ms=" << g_FileInfoWnd->LastShowMs() << "\n";
     }
@@ -277,6 +294,12 @@ void CTestHook::RunScriptCommand(CAudioEncDlg& dlg, const std::string& line) {
     std::getline(in >> std::ws, rest);
     in.clear();
     in.str(rest);
+    // A script may fill the rip or burn list before it opens the tab.
+    if (verb.rfind("burn", 0) == 0) {
+        dlg.EnsureModePanel(2);
+    } else if (verb.rfind("rip", 0) == 0) {
+        dlg.EnsureModePanel(1);
+    }
     if (verb == "add" && g_MediaList != nullptr) {
         g_MediaList->AddFile(rest, -1);
     } else if (verb == "addfolder" && g_MediaList != nullptr) {

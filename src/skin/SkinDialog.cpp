@@ -24,7 +24,45 @@ bool ImSkinObject::OnSkinChanged(const std::string& /*skinDir*/) {
 ImSkinDialog::ImSkinDialog(wxWindow* self, int dialogId)
     : ImSkinObject(self), m_skin(&g_Language), m_nDialogId(dialogId) {}
 
-ImSkinDialog::~ImSkinDialog() = default;
+namespace {
+
+int s_layoutHolds = 0;
+std::vector<ImSkinDialog*> s_heldLayouts;
+
+}  // namespace
+
+ImSkinDialog::~ImSkinDialog() {
+    std::erase(s_heldLayouts, this);
+}
+
+void ImSkinDialog::RecalcLayout() {
+    if (s_layoutHolds > 0) {
+        if (std::find(s_heldLayouts.begin(), s_heldLayouts.end(), this) == s_heldLayouts.end()) {
+            s_heldLayouts.push_back(this);
+        }
+        return;
+    }
+    std::erase(s_heldLayouts, this);
+    DoRecalcLayout();
+}
+
+void ImSkinDialog::HoldLayouts() {
+    ++s_layoutHolds;
+}
+
+void ImSkinDialog::ReleaseLayouts() {
+    if (s_layoutHolds == 0 || --s_layoutHolds > 0) {
+        return;
+    }
+    std::stable_partition(s_heldLayouts.begin(), s_heldLayouts.end(),
+                          [](ImSkinDialog* dialog) { return dialog->m_hWnd->IsTopLevel(); });
+    // A window laid out here lays out the panels it resizes, which leave the list then.
+    while (!s_heldLayouts.empty()) {
+        ImSkinDialog* next = s_heldLayouts.front();
+        s_heldLayouts.erase(s_heldLayouts.begin());
+        next->DoRecalcLayout();
+    }
+}
 
 void ImSkinDialog::InitSkinDialog() {
     m_hWnd->SetBackgroundStyle(wxBG_STYLE_PAINT);
@@ -89,7 +127,7 @@ bool ImSkinDialog::OnSkinChanged(const std::string& skinDir) {
     return true;
 }
 
-void ImSkinDialog::RecalcLayout() {
+void ImSkinDialog::DoRecalcLayout() {
     const int border = m_metrics.BorderWidth;
     const int t = m_titleBarBorder ? border : 0;
     const int m = m_menuBarBorder ? border : 0;

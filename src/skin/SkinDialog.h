@@ -53,8 +53,15 @@ public:
     ~ImSkinDialog() override;
 
     virtual void OnLanguageChanged() {}
-    virtual void RecalcLayout();
+    // Places the window's parts now, or, while layouts are held, once the hold ends.
+    void RecalcLayout();
+    // While a window of many panels is built, every panel's skin, text and size change asks
+    // for a layout; held, each window is laid out once, at its final size, on release (the
+    // top-level windows first, which sizes the panels in them). Nests; UI thread only.
+    static void HoldLayouts();
+    static void ReleaseLayouts();
     virtual const char* GetSkinSection() const { return ""; }
+    virtual void DoRecalcLayout();
     virtual bool CanResize() const { return false; }
     // Before a popup of the menu bar opens: the window sets check marks and enable states.
     virtual void OnInitMenuPopup(class wxMenu* /*menu*/) {}
@@ -135,7 +142,7 @@ public:
     virtual void OnSkinCommand() {}
 
     bool OnSkinChanged(const std::string& skinDir) override;
-    void RecalcLayout() override;
+    void DoRecalcLayout() override;
 
     // Restores the remembered rectangle or centres the window at its default size.
     void InitialPlacement();

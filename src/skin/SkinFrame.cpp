@@ -48,8 +48,8 @@ bool ImSkinFrame::OnSkinChanged(const std::string& skinDir) {
     return taken;
 }
 
-void ImSkinFrame::RecalcLayout() {
-    ImSkinDialog::RecalcLayout();
+void ImSkinFrame::DoRecalcLayout() {
+    ImSkinDialog::DoRecalcLayout();
     if (m_statusStrip != nullptr && m_bStatusShown) {
         m_statusStrip->SetSize(m_contentRect.x, m_contentRect.GetBottom() + 1 - m_statusHeight,
                                m_contentRect.width, m_statusHeight);

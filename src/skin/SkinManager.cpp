@@ -75,6 +75,20 @@ std::string ImSkinManager::GetImagePath(const ImLanguage* language,
     return path;
 }
 
+void ImSkinManager::DressLateListener(ImSkinListener* listener) {
+    AddListener(listener);
+    if (m_strSkinName.empty()) {
+        return;
+    }
+    if (listener->DefersSkin()) {
+        if (std::find(m_deferred.begin(), m_deferred.end(), listener) == m_deferred.end()) {
+            m_deferred.push_back(listener);
+        }
+        return;
+    }
+    listener->OnSkinChanged(m_strSkinDir);
+}
+
 bool ImSkinManager::AddListener(ImSkinListener* listener) {
     if (listener == nullptr ||
         std::find(m_listeners.begin(), m_listeners.end(), listener) != m_listeners.end()) {

@@ -35,6 +35,8 @@ public:
     bool AddListener(ImSkinListener* listener);
     // Hands a listener the skin it put off while out of sight; nothing when it put off none.
     void TakeDeferredSkin(ImSkinListener* listener);
+    // Adds a listener made after the start and dresses it in the current skin.
+    void DressLateListener(ImSkinListener* listener);
     void SetRoot(std::string root) { m_strRoot = std::move(root); }
     const std::string& GetRoot() const { return m_strRoot; }
 

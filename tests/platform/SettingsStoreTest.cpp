@@ -125,6 +125,36 @@ TEST_F(SettingsStoreTest, ChangesMadeByAnotherProgramAreSeen) {
     EXPECT_EQ(theirs.Read(kKey, "a")->number, 3);
 }
 
+TEST_F(SettingsStoreTest, HeldWritesAreReadAtOnceAndReachTheFileInOneWriteOverOthers) {
+    SettingsStore mine(file);
+    SettingsStore theirs(file);
+    ASSERT_TRUE(theirs.WriteInt(kKey, "shared", 1));
+    mine.HoldWrites();
+    mine.HoldWrites();  // nested: the inner release writes nothing yet
+    ASSERT_TRUE(mine.WriteInt(kKey, "shared", 2));
+    ASSERT_TRUE(mine.WriteString(kKey, "language", "Deutsch"));
+    ASSERT_TRUE(mine.WriteInt(kKey, "shared", 3));
+    EXPECT_EQ(mine.Read(kKey, "shared")->number, 3);
+    EXPECT_FALSE(theirs.Read(kKey, "language"));
+    // Another program writes meanwhile: this store's reads see it under the held values.
+    ASSERT_TRUE(theirs.WriteInt(kKey, "theirs", 9));
+    ASSERT_TRUE(theirs.WriteInt(kKey, "shared", 5));
+    EXPECT_EQ(mine.Read(kKey, "theirs")->number, 9);
+    EXPECT_EQ(mine.Read(kKey, "shared")->number, 3);
+    const auto before = std::filesystem::last_write_time(file);
+    ASSERT_TRUE(mine.ReleaseWrites());
+    EXPECT_EQ(std::filesystem::last_write_time(file), before);
+    EXPECT_FALSE(theirs.Read(kKey, "language"));
+    ASSERT_TRUE(mine.ReleaseWrites());
+    SettingsStore reopened(file);
+    EXPECT_EQ(reopened.Read(kKey, "shared")->number, 3);
+    EXPECT_EQ(reopened.Read(kKey, "language")->text, "Deutsch");
+    EXPECT_EQ(reopened.Read(kKey, "theirs")->number, 9);
+    // Released, writes go to the file at once again.
+    ASSERT_TRUE(mine.WriteInt(kKey, "after", 1));
+    EXPECT_EQ(SettingsStore(file).Read(kKey, "after")->number, 1);
+}
+
 TEST_F(SettingsStoreTest, ConcurrentWritersOfDifferentKeysLoseNothing) {
     SettingsStore shared(file);
     constexpr int kRounds = 40;

@@ -173,9 +173,13 @@ TEST_F(MainWindowTest, SwitchingTabsSwitchesPanelMenuAndTheRememberedMode) {
     EXPECT_NE(state.at("visible").find("MediaList;"), std::string::npos);
     EXPECT_EQ(state.at("tabs"), "Convert-|Rip+|Burn+|");
     EXPECT_EQ(state.at("gauge"), "0|0|0") << "a plain bar: no disc scale in the convert mode";
+    // The rip and burn panels are made when their tabs first show them.
+    EXPECT_EQ(state.at("made"), "MediaList;OutputPanel;PlayerPanel;SideBar;StatusBar;");
 
     program.Send("tab 2");
     state = program.WaitFor([](const State& s) { return s.at("mode") == "2"; });
+    EXPECT_EQ(state.at("made"),
+              "MediaList;CDCreatorPanel;OutputPanel;PlayerPanel;SideBar;StatusBar;");
     EXPECT_EQ(state.at("menu"), "170");
     EXPECT_EQ(state.at("captions"), "&File|&Edit|&Burn|&Options|&Help|");
     EXPECT_NE(state.at("visible").find("CDCreatorPanel;"), std::string::npos);
@@ -195,6 +199,9 @@ TEST_F(MainWindowTest, SwitchingTabsSwitchesPanelMenuAndTheRememberedMode) {
     state = again.WaitShown();
     EXPECT_EQ(state.at("mode"), "1");
     EXPECT_EQ(state.at("menu"), "171");
+    EXPECT_EQ(state.at("made"), "MediaList;OutputPanel;PlayerPanel;CDRip;SideBar;StatusBar;");
+    again.Send("close");
+    ASSERT_TRUE(again.WaitForExit());
 }
 
 std::string Screenshot(const ac::test::TempDir& dir, const std::string& name) {

@@ -152,6 +152,32 @@ TEST_F(SkinCatalogueTest, AHiddenListenerTakesTheLatestSkinWhenShown) {
     EXPECT_EQ(log.size(), 3u) << "a shown listener hears every change again";
 }
 
+// A panel made after the start (a tab opened late) wears the skin chosen before it existed:
+// at once when shown, when it first shows when hidden.
+TEST_F(SkinCatalogueTest, AListenerMadeLateTakesTheCurrentSkin) {
+    std::vector<std::string> log;
+    Recorder early(log, "early");
+    g_Skin.AddListener(&early);
+    Recorder beforeAnySkin(log, "none");
+    g_Skin.DressLateListener(&beforeAnySkin);
+    EXPECT_TRUE(log.empty()) << "no skin yet: nothing to wear";
+    ASSERT_TRUE(g_Skin.SetSkin("Blue"));
+    const std::string blue = Logical("Skin\\Blue");
+    log.clear();
+    Recorder late(log, "late");
+    g_Skin.DressLateListener(&late);
+    Recorder hiddenLate(log, "hidden");
+    hiddenLate.hidden = true;
+    g_Skin.DressLateListener(&hiddenLate);
+    EXPECT_EQ(log, std::vector<std::string>{"late:" + blue});
+    hiddenLate.hidden = false;
+    g_Skin.TakeDeferredSkin(&hiddenLate);
+    EXPECT_EQ(log, (std::vector<std::string>{"late:" + blue, "hidden:" + blue}));
+    log.clear();
+    ASSERT_TRUE(g_Skin.SetSkin("Default"));
+    EXPECT_EQ(log.size(), 4u) << "every one of them hears the next change";
+}
+
 TEST_F(SkinCatalogueTest, StartChoiceFallsBackToDefaultThenToAnyTakingSkin) {
     EXPECT_TRUE(g_Skin.ChooseStartSkin("Removed"));
     EXPECT_EQ(g_Skin.GetSkinName(), "Default");

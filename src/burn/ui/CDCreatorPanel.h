@@ -157,7 +157,7 @@ public:
 
     // ---- Skinned window ----
     void OnLanguageChanged() override;
-    void RecalcLayout() override;
+    void DoRecalcLayout() override;
     bool OnSkinChanged(const std::string& skinDir) override;
 
 private:

@@ -347,8 +347,8 @@ bool CCDCreatorPanel::OnSkinChanged(const std::string& skinDir) {
     return true;
 }
 
-void CCDCreatorPanel::RecalcLayout() {
-    ImSkinDialog::RecalcLayout();
+void CCDCreatorPanel::DoRecalcLayout() {
+    ImSkinDialog::DoRecalcLayout();
     if (m_list == nullptr)
         return;
     const wxSize client = GetClientSize();

@@ -351,8 +351,8 @@ bool CMediaListWnd::OnSkinChanged(const std::string& skinDir) {
     return true;
 }
 
-void CMediaListWnd::RecalcLayout() {
-    ImSkinDialog::RecalcLayout();
+void CMediaListWnd::DoRecalcLayout() {
+    ImSkinDialog::DoRecalcLayout();
     if (m_list == nullptr) {
         return;
     }

@@ -102,7 +102,7 @@ public:
 
     // ---- Skinned window ----
     void OnLanguageChanged() override;
-    void RecalcLayout() override;
+    void DoRecalcLayout() override;
     bool OnSkinChanged(const std::string& skinDir) override;
 
 private:

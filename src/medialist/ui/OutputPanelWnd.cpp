@@ -251,8 +251,8 @@ bool COutputPanelWnd::OnSkinChanged(const std::string& skinDir) {
     return true;
 }
 
-void COutputPanelWnd::RecalcLayout() {
-    ImSkinDialog::RecalcLayout();
+void COutputPanelWnd::DoRecalcLayout() {
+    ImSkinDialog::DoRecalcLayout();
     if (m_copies == nullptr) {
         return;
     }

@@ -52,7 +52,7 @@ public:
     int GetCopies() const;
 
     void OnLanguageChanged() override;
-    void RecalcLayout() override;
+    void DoRecalcLayout() override;
     bool OnSkinChanged(const std::string& skinDir) override;
 
 private:

@@ -97,8 +97,8 @@ bool CSideBarWnd::OnSkinChanged(const std::string& skinDir) {
 
 // ---- Layout ----
 
-void CSideBarWnd::RecalcLayout() {
-    ImSkinDialog::RecalcLayout();
+void CSideBarWnd::DoRecalcLayout() {
+    ImSkinDialog::DoRecalcLayout();
     if (m_grid == nullptr)
         return;
     const wxSize client = GetClientSize();

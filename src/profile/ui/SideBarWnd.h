@@ -66,7 +66,7 @@ public:
     ~CSideBarWnd() override;
 
     void OnLanguageChanged() override;
-    void RecalcLayout() override;
+    void DoRecalcLayout() override;
     bool OnSkinChanged(const std::string& skinDir) override;
 
     // ---- What the main dialog calls ----

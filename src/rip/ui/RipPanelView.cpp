@@ -408,8 +408,8 @@ bool CDRipDlg::OnSkinChanged(const std::string& skinDir) {
     return true;
 }
 
-void CDRipDlg::RecalcLayout() {
-    ImSkinDialog::RecalcLayout();
+void CDRipDlg::DoRecalcLayout() {
+    ImSkinDialog::DoRecalcLayout();
     if (m_list == nullptr) return;
     const wxSize client = GetClientSize();
     const int left = m_metrics.LeftMargin;
