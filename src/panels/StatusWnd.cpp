@@ -58,11 +58,8 @@ CStatusWnd::CStatusWnd(wxWindow* parent)
     : ImSkinPanel(parent, kPanelId, "StatusBar", kDialogId),
       m_bar(new CapacityBar(this, kBarId)),
       m_logButton(new ImButton(this, kLogButtonId)),
-      m_richEdit(CreateRichEdit(this, kRichEditId)),
-      m_logWnd(nullptr),
       m_timer(this, kTimerId),
       m_self(std::make_shared<const wxWeakRef<CStatusWnd>>(this)) {
-    m_richEdit->Hide();
     if (GetAppConfig().GetInt("last_run_function") == 2) {
         SetAudioDiscScale();
     } else {
@@ -71,7 +68,6 @@ CStatusWnd::CStatusWnd(wxWindow* parent)
     m_bar->SetFramed(false);
     m_bar->SetTileOffset(1, 1);
     m_bar->Show();
-    m_logWnd = new CLogWnd(this);
     m_logButton->SetTextShown(false);
     TranslateToolTips();
     Bind(
@@ -94,15 +90,26 @@ CStatusWnd::~CStatusWnd() {
     }
 }
 
-wxTextCtrl* CStatusWnd::GetLogControl() const {
-    if (auto* here = dynamic_cast<wxTextCtrl*>(FindWindow(kRichEditId));
-        here != nullptr && here->GetParent() == this) {
-        return here;
+// A rich edit and a dialog of its own cost the start a tenth of its time: they are made with
+// the first line of a log or the first look at it.
+wxTextCtrl* CStatusWnd::GetLogControl() {
+    if (m_richEdit == nullptr) {
+        m_richEdit = CreateRichEdit(this, kRichEditId);
+        m_richEdit->Hide();
+        m_logWnd = new CLogWnd(this);
     }
-    return m_logWnd != nullptr ? m_logWnd->Content() : nullptr;
+    return m_richEdit->GetParent() == this ? m_richEdit : m_logWnd->Content();
+}
+
+const wxTextCtrl* CStatusWnd::ExistingLogControl() const {
+    if (m_richEdit == nullptr) {
+        return nullptr;
+    }
+    return m_richEdit->GetParent() == this ? m_richEdit : m_logWnd->Content();
 }
 
 void CStatusWnd::ShowLog() {
+    GetLogControl();
     if (m_richEdit->GetParent() == this) {
         m_logWnd->Attach(m_richEdit);
     }
@@ -111,8 +118,8 @@ void CStatusWnd::ShowLog() {
 }
 
 void CStatusWnd::ClearLog() {
-    if (wxTextCtrl* log = GetLogControl()) {
-        log->Clear();
+    if (m_richEdit != nullptr) {
+        GetLogControl()->Clear();
     }
 }
 
@@ -138,7 +145,7 @@ int CStatusWnd::GetNeededHeight() const {
 
 std::string CStatusWnd::DescribeState() const {
     std::string log;
-    if (const wxTextCtrl* control = GetLogControl()) {
+    if (const wxTextCtrl* control = ExistingLogControl()) {
         log = RichEditText(*control);
     }
     std::replace(log.begin(), log.end(), '\n', '|');
@@ -218,7 +225,9 @@ void CStatusWnd::OnLanguageChanged() {
     TranslateWindow(*this, kDialogId);
     m_bar->SetUnitText(wxString::FromUTF8(g_Language.GetString(kMinuteText)));
     m_bar->Refresh(false);
-    m_logWnd->OnLanguageChanged();
+    if (m_logWnd != nullptr) {
+        m_logWnd->OnLanguageChanged();
+    }
 }
 
 void CStatusWnd::DoRecalcLayout() {

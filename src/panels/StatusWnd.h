@@ -36,8 +36,9 @@ public:
     explicit CStatusWnd(wxWindow* parent);
     ~CStatusWnd() override;
 
-    // The log's rich edit: still here, or already handed to the log window.
-    wxTextCtrl* GetLogControl() const;
+    // The log's rich edit: still here, or already handed to the log window; made on the first
+    // call.
+    wxTextCtrl* GetLogControl();
     // Hands the rich edit to the log window the first time, then shows the window in front.
     void ShowLog();
     void ClearLog();
@@ -64,13 +65,14 @@ public:
 
 private:
     void AppendOnUi(const std::string& text, LogLineKind kind);
+    const wxTextCtrl* ExistingLogControl() const;
     void TranslateToolTips();
     void SetAudioDiscScale();
 
     CapacityBar* m_bar;
     ImButton* m_logButton;
-    wxTextCtrl* m_richEdit;
-    CLogWnd* m_logWnd;
+    wxTextCtrl* m_richEdit = nullptr;
+    CLogWnd* m_logWnd = nullptr;
     wxTimer m_timer;
     // Copied by reader threads into their posts; read and cleared on the UI thread only.
     std::shared_ptr<const wxWeakRef<CStatusWnd>> m_self;

@@ -111,6 +111,10 @@ TEST_F(StatusWndTest, PostsForAPanelThatIsGoneAreDropped) {
 }
 
 TEST_F(StatusWndTest, LogTextStaysWhenTheLogWindowIsClosedAndOpenedAgain) {
+    EXPECT_EQ(m_panel->FindWindow(CStatusWnd::kRichEditId), nullptr)
+        << "the log is made when it is first needed, not with the panel";
+    m_panel->ClearLog();
+    EXPECT_EQ(m_panel->FindWindow(CStatusWnd::kRichEditId), nullptr);
     wxTextCtrl* control = m_panel->GetLogControl();
     ASSERT_NE(control, nullptr);
     EXPECT_EQ(control->GetParent(), m_panel);

@@ -55,19 +55,12 @@ bool CSideBarWnd::OnSkinChanged(const std::string& skinDir) {
     m_grid->SetTextColour2(textColour);
     m_profileLabel->SetFont(titleFont);
     m_profileLabel->SetTextColour(titleColour);
+    for (ImLabel* label : {m_bitRateLabel, m_sampleRateLabel, m_channelsLabel, m_volumeLabel}) {
+        label->SetFont(font);
+        label->SetTextColour(textColour);
+    }
     for (ImLabel* label :
-         {m_bitRateLabel, m_sampleRateLabel, m_channelsLabel, m_volumeLabel, m_volumeNameLabel}) {
-        label->SetFont(font);
-        label->SetTextColour(textColour);
-    }
-    for (ImLabel* label : m_discLabels) {
-        label->SetFont(font);
-        label->SetTextColour(textColour);
-    }
-    for (ImLabel* label : m_discLabels)
-        label->SetBgColor(panelBg);
-    for (ImLabel* label : {m_profileLabel, m_bitRateLabel, m_sampleRateLabel, m_channelsLabel,
-                           m_volumeLabel, m_volumeNameLabel}) {
+         {m_profileLabel, m_bitRateLabel, m_sampleRateLabel, m_channelsLabel, m_volumeLabel}) {
         label->SetBgColor(panelBg);
     }
     for (ImTickSlider* slider : {m_bitRateSlider, m_sampleRateSlider, m_volumeSlider}) {
@@ -76,9 +69,7 @@ bool CSideBarWnd::OnSkinChanged(const std::string& skinDir) {
         slider->SetColours(panelBg, textColour);
         slider->SetFont(font);
     }
-    m_balance->SetFaces(picture("CheckBox_Unchecked"), picture("CheckBox_Checked"));
-    m_balance->SetColours(textColour, wxColour(0x80, 0x80, 0x80));
-    m_balance->SetFont(font);
+    DressDiscControls();
     m_advancedButton->SetPicture(LoadSkinPicture("mode_nor.bmp"));
     m_simpleButton->SetPicture(LoadSkinPicture("mode_adv.bmp"));
     m_saveButton->SetPicture(LoadSkinPicture("ProfileMenu.bmp"));
@@ -93,6 +84,25 @@ bool CSideBarWnd::OnSkinChanged(const std::string& skinDir) {
     RecalcLayout();
     Refresh();
     return true;
+}
+
+void CSideBarWnd::DressDiscControls() {
+    if (m_discType == nullptr || m_skin.GetDir().empty())
+        return;
+    const char* section = GetSkinSection();
+    const wxFont font = MakeSkinFont(m_skin.GetFont(section));
+    const wxColour textColour = NativeColour(m_skin.GetRgbColour("TextColor", 0, section));
+    std::vector<ImLabel*> labels = m_discLabels;
+    labels.push_back(m_volumeNameLabel);
+    for (ImLabel* label : labels) {
+        label->SetFont(font);
+        label->SetTextColour(textColour);
+        label->SetBgColor(Look().childBg);
+    }
+    m_balance->SetFaces(LoadSkinPicture(m_skin.GetString("CheckBox_Unchecked", "", section)),
+                        LoadSkinPicture(m_skin.GetString("CheckBox_Checked", "", section)));
+    m_balance->SetColours(textColour, wxColour(0x80, 0x80, 0x80));
+    m_balance->SetFont(font);
 }
 
 // ---- Layout ----
@@ -124,7 +134,8 @@ void CSideBarWnd::DoRecalcLayout() {
     const int selectorHeight = std::max(saveSize.y, m_profileSelector->GetBestSize().y);
     const int selectorWidth = std::max(20, width - saveSize.x - m_metrics.HSpacing);
     m_profileSelector->SetSize(left, y, selectorWidth, selectorHeight);
-    m_discType->SetSize(left, y, selectorWidth, selectorHeight);
+    if (m_discType != nullptr)
+        m_discType->SetSize(left, y, selectorWidth, selectorHeight);
     m_saveButton->SetSize(left + width - saveSize.x, y + (selectorHeight - saveSize.y) / 2,
                           saveSize.x, saveSize.y);
     y += selectorHeight + m_metrics.VSpacing;
@@ -152,6 +163,8 @@ void CSideBarWnd::LayoutSimpleGroup(int x, int y, int width) {
     y += kLabelHeight;
     m_channels->SetSize(x, y, width, std::max(kEditHeight, m_channels->GetBestSize().y));
     y += m_channels->GetSize().y + 2 * gap;
+    if (m_volumeName == nullptr)
+        return;
     m_volumeNameLabel->SetSize(x, y, width, kLabelHeight);
     y += kLabelHeight;
     m_volumeName->SetSize(x, y, width, kEditHeight);
@@ -217,6 +230,13 @@ void CSideBarWnd::ShowGroup(const std::vector<wxWindow*>& group, bool show) {
         window->Show(show);
 }
 
+void CSideBarWnd::ShowVolumeName(bool show) {
+    if (m_volumeName != nullptr) {
+        m_volumeNameLabel->Show(show);
+        m_volumeName->Show(show);
+    }
+}
+
 void CSideBarWnd::ApplyMode(bool advanced) {
     const bool audioCd = [&] {
         if (m_firstShow) {
@@ -230,25 +250,23 @@ void CSideBarWnd::ApplyMode(bool advanced) {
     if (advanced) {
         ShowGroup(m_simpleGroup, false);
         ShowGroup(m_discGroup, false);
-        m_volumeNameLabel->Hide();
-        m_volumeName->Hide();
+        ShowVolumeName(false);
         m_grid->Show();
         return;
     }
     m_grid->Hide();
     if (audioCd) {
+        EnsureDiscControls();
         ShowGroup(m_discGroup, true);
         ShowGroup(m_simpleGroup, false);
-        m_volumeNameLabel->Hide();
-        m_volumeName->Hide();
+        ShowVolumeName(false);
         m_advancedButton->Enable(false);
         m_simpleButton->Enable(false);
         return;
     }
     ShowGroup(m_simpleGroup, true);
     ShowGroup(m_discGroup, false);
-    m_volumeNameLabel->Hide();
-    m_volumeName->Hide();
+    ShowVolumeName(false);
     m_advancedButton->Enable(!m_advanced);
     m_simpleButton->Enable(m_advanced);
 }
@@ -260,8 +278,7 @@ void CSideBarWnd::OnAdvancedPressed(bool advanced) {
     m_simpleButton->Enable(advanced);
     if (!advanced) {
         const bool discName = m_workMode == 2 && GetDiscType() != 0;
-        m_volumeNameLabel->Show(discName);
-        m_volumeName->Show(discName);
+        ShowVolumeName(discName);
     }
 }
 
@@ -269,8 +286,11 @@ void CSideBarWnd::OnWorkModeChanged(int mode) {
     m_firstShow = false;
     m_workMode = mode;
     const bool burn = mode == 2;
+    if (burn)
+        EnsureDiscControls();
     m_profileSelector->Show(!burn);
-    m_discType->Show(burn);
+    if (m_discType != nullptr)
+        m_discType->Show(burn);
     m_profileSelector->Enable(!burn);
     // A burn disc type stands for a fixed system profile: there is nothing of the user's to save.
     m_saveButton->Enable(!burn);
@@ -284,18 +304,20 @@ void CSideBarWnd::OnWorkModeChanged(int mode) {
 }
 
 int CSideBarWnd::GetDiscType() const {
+    if (m_discType == nullptr)
+        return 0;
     const int type = m_discType->GetSelection();
     return type == wxNOT_FOUND ? 0 : type;
 }
 
 void CSideBarWnd::SelectDiscType(int type) {
+    EnsureDiscControls();
     m_discType->SetSelection(std::clamp(type, 0, 2));
     type = GetDiscType();
     if (type == 0 || !m_advanced) {
         ApplyMode(false);
         if (type != 0) {
-            m_volumeNameLabel->Show();
-            m_volumeName->Show();
+            ShowVolumeName(true);
         }
     } else {
         ApplyMode(true);

@@ -74,7 +74,10 @@ CSideBarWnd::CSideBarWnd(wxWindow* parent)
     OnLanguageChanged();
     const bool burn = GetAppConfig().GetInt("last_run_function", nullptr, 0) == 2;
     m_profileSelector->Show(!burn);
-    m_discType->Show(burn);
+    if (burn) {
+        EnsureDiscControls();
+        m_discType->Show();
+    }
     m_grid->Hide();
     m_advancedButton->Enable(true);
     m_simpleButton->Enable(false);
@@ -93,7 +96,6 @@ void CSideBarWnd::CreateControls() {
     m_advancedButton = new ImButton(this, kAdvanced, "Advanced");
     m_simpleButton = new ImButton(this, kSimple, "Simple");
     m_profileSelector = new wxChoice(this, kProfileSelector);
-    m_discType = new wxChoice(this, kDiscType);
     m_saveButton = new ImButton(this, kSaveProfile, "SaveProfile");
     // The skin draws this one as a menu glyph; its words would not fit beside the selector.
     m_saveButton->SetTextShown(false);
@@ -107,11 +109,28 @@ void CSideBarWnd::CreateControls() {
     m_volumeSlider = new ImTickSlider(this, kVolumeSlider);
     m_channelsLabel = new ImLabel(this, kChannelsLabel, "Channels:");
     m_channels = new wxChoice(this, kChannels);
-    m_volumeNameLabel = new ImLabel(this, kVolumeNameLabel, "Juanbiao:");
-    m_volumeName = new wxTextCtrl(this, kVolumeName, Wx(g_Language.GetString(kNewDiscText)));
     m_simpleGroup = {m_bitRateLabel, m_bitRateSlider, m_sampleRateLabel, m_sampleRateSlider,
                      m_volumeLabel,  m_volumeSlider,  m_channelsLabel,   m_channels};
 
+    m_bitRateSlider->SetRange(0, static_cast<int>(kBitRates.size()) - 1);
+    m_bitRateSlider->SetTicks(static_cast<int>(kBitRates.size()) - 1);
+    m_bitRateSlider->SetPos(kBitRateStart);
+    m_sampleRateSlider->SetRange(0, static_cast<int>(kSampleRates.size()) - 1);
+    m_sampleRateSlider->SetTicks(static_cast<int>(kSampleRates.size()) - 1);
+    m_sampleRateSlider->SetPos(kSampleRateStart);
+    m_volumeSlider->SetRange(0, kVolumePositions - 1);
+    m_volumeSlider->SetTicks(kVolumePositions - 1);
+    m_volumeSlider->SetPos(kVolumeStart);
+}
+
+// The burn mode's controls (the disc type, the audio disc's boxes, the data disc's name) are
+// made when that mode first shows: most starts never need them, and native boxes are dear.
+void CSideBarWnd::EnsureDiscControls() {
+    if (m_discType != nullptr)
+        return;
+    m_discType = new wxChoice(this, kDiscType);
+    m_volumeNameLabel = new ImLabel(this, kVolumeNameLabel, "Juanbiao:");
+    m_volumeName = new wxTextCtrl(this, kVolumeName, Wx(g_Language.GetString(kNewDiscText)));
     const std::pair<int, int> discRows[] = {
         {kAlbumLabel, kAlbum}, {kArtistLabel, kArtist}, {kTitleLabel, kTitle}};
     for (const auto& [labelId, editId] : discRows) {
@@ -128,16 +147,29 @@ void CSideBarWnd::CreateControls() {
     m_discGroup.push_back(m_interval);
     m_balance = new ImCheckBox(this, kBalance, "Balance");
     m_discGroup.push_back(m_balance);
+    for (wxWindow* control : std::initializer_list<wxWindow*>{m_discType, m_volumeName, m_interval})
+        FollowSkinColours(control);
+    for (wxWindow* control : m_discGroup)
+        if (dynamic_cast<wxTextCtrl*>(control) != nullptr)
+            FollowSkinColours(control);
+    m_discType->Hide();
+    m_volumeNameLabel->Hide();
+    m_volumeName->Hide();
+    ShowGroup(m_discGroup, false);
+    TranslateLabels();
+    TranslateDiscControls();
+    DressDiscControls();
+    RecalcLayout();
+}
 
-    m_bitRateSlider->SetRange(0, static_cast<int>(kBitRates.size()) - 1);
-    m_bitRateSlider->SetTicks(static_cast<int>(kBitRates.size()) - 1);
-    m_bitRateSlider->SetPos(kBitRateStart);
-    m_sampleRateSlider->SetRange(0, static_cast<int>(kSampleRates.size()) - 1);
-    m_sampleRateSlider->SetTicks(static_cast<int>(kSampleRates.size()) - 1);
-    m_sampleRateSlider->SetPos(kSampleRateStart);
-    m_volumeSlider->SetRange(0, kVolumePositions - 1);
-    m_volumeSlider->SetTicks(kVolumePositions - 1);
-    m_volumeSlider->SetPos(kVolumeStart);
+void CSideBarWnd::TranslateDiscControls() {
+    if (m_discType == nullptr)
+        return;
+    const int discType = m_discType->GetSelection();
+    m_discType->Clear();
+    for (std::uint32_t id : kDiscTypeTexts)
+        m_discType->Append(Wx(g_Language.GetString(id)));
+    m_discType->SetSelection(discType == wxNOT_FOUND ? 0 : discType);
 }
 
 void CSideBarWnd::BindEvents() {
@@ -180,23 +212,23 @@ void CSideBarWnd::BindEvents() {
         wxEVT_UPDATE_UI, [this](wxUpdateUIEvent&) { UpdateEnabling(); }, kSideBarPanelId);
 }
 
-void CSideBarWnd::OnLanguageChanged() {
+void CSideBarWnd::TranslateLabels() {
     // Back to the built-in words first, so a language without these texts shows English.
     for (const DefaultText& entry : kDefaultTexts) {
         if (wxWindow* control = FindWindow(entry.id))
             control->SetLabel(entry.text);
     }
     TranslateWindow(*this, m_nDialogId);
+}
+
+void CSideBarWnd::OnLanguageChanged() {
+    TranslateLabels();
     const int channels = m_channels->GetSelection();
     m_channels->Clear();
     m_channels->Append(Wx(g_Language.GetString(kMonoText)));
     m_channels->Append(Wx(g_Language.GetString(kStereoText)));
     m_channels->SetSelection(channels == wxNOT_FOUND ? kChannelsStart : channels);
-    const int discType = m_discType->GetSelection();
-    m_discType->Clear();
-    for (std::uint32_t id : kDiscTypeTexts)
-        m_discType->Append(Wx(g_Language.GetString(id)));
-    m_discType->SetSelection(discType == wxNOT_FOUND ? 0 : discType);
+    TranslateDiscControls();
     RebuildSelectorTexts();
     SetBitRateLabel(m_bitRateShown);
     SetSampleRateLabel(m_sampleRateShown);

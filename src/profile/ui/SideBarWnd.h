@@ -138,6 +138,11 @@ private:
     void UpdateEnabling();
     void LayoutSimpleGroup(int x, int y, int width);
     void LayoutDiscGroup(int x, int y, int width);
+    void EnsureDiscControls();
+    void TranslateLabels();
+    void TranslateDiscControls();
+    void DressDiscControls();
+    void ShowVolumeName(bool show);
     void ShowGroup(const std::vector<wxWindow*>& group, bool show);
     bool RunNameDialog(CSaveProfileDlg& dialog);
     int CurrentWorkMode() const;
