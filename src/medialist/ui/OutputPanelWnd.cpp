@@ -61,8 +61,6 @@ COutputPanelWnd::COutputPanelWnd(wxWindow* parent)
     m_showType = config.GetInt("last_run_function");
     CreateControls();
     FollowSkinColoursBelow(this);
-    m_copies->ChangeValue(
-        std::to_string(std::clamp(config.GetInt("burncopies"), kCopiesMin, kCopiesMax)));
     // A folder that cannot be made stays unmade: the driver reports it when a job starts.
     platform::EnsureDirectory(ReadFolderKey(config, "OutputDir"), kUserFolderMode);
     platform::EnsureDirectory(ReadFolderKey(config, "OutputCDDir"), kUserFolderMode);
@@ -83,12 +81,6 @@ void COutputPanelWnd::CreateControls() {
     m_directory = new wxTextCtrl(this, 1020, wxEmptyString);
     m_browse = new ImButton(this, 1021, "Browse...");
     m_open = new ImButton(this, 1023, "Open");
-    m_recorderLabel = new ImLabel(this, 1179, "CD Recorder:");
-    m_recorder = new wxChoice(this, 1180);
-    m_speedLabel = new ImLabel(this, 1183, "Burn Speed:");
-    m_speed = new wxChoice(this, 1181);
-    m_copiesLabel = new ImLabel(this, 1182, "Burn Copies:");
-    m_copies = new wxTextCtrl(this, 1102, wxEmptyString, wxDefaultPosition, wxSize(40, -1));
 
     m_directory->Bind(wxEVT_TEXT, [this](wxCommandEvent&) { UpdateDirectoryCopy(); });
     m_directory->Bind(wxEVT_KILL_FOCUS, [this](wxFocusEvent& event) {
@@ -99,21 +91,46 @@ void COutputPanelWnd::CreateControls() {
     m_open->Bind(wxEVT_BUTTON, [this](wxCommandEvent&) { OpenFolder(); });
 }
 
-void COutputPanelWnd::MakeCopiesSpin() {
-    // GTK's spin button is among the dearest controls to make, and only the burn mode shows
-    // it: made when that mode is first laid out.
+void COutputPanelWnd::MakeBurnControls() {
+    // Native lists and GTK's spin button are among the dearest controls to make, and only the
+    // burn mode shows them: made when that mode first needs them.
     if (m_spin != nullptr) {
         return;
     }
+    m_recorderLabel = new ImLabel(this, 1179, "CD Recorder:");
+    m_recorder = new wxChoice(this, 1180);
+    m_speedLabel = new ImLabel(this, 1183, "Burn Speed:");
+    m_speed = new wxChoice(this, 1181);
+    m_copiesLabel = new ImLabel(this, 1182, "Burn Copies:");
+    m_copies = new wxTextCtrl(this, 1102, wxEmptyString, wxDefaultPosition, wxSize(40, -1));
     m_spin = new wxSpinButton(this, 1184, wxDefaultPosition, wxDefaultSize, wxSP_VERTICAL);
-    FollowSkinColours(m_spin);
+    for (wxWindow* native : std::initializer_list<wxWindow*>{m_recorder, m_speed, m_copies, m_spin}) {
+        FollowSkinColours(native);
+        native->Hide();
+    }
+    for (ImLabel* label : {m_recorderLabel, m_speedLabel, m_copiesLabel}) {
+        label->Hide();
+    }
+    const int copies =
+        std::clamp(GetAppConfig().GetInt("burncopies"), kCopiesMin, kCopiesMax);
+    m_copies->ChangeValue(std::to_string(copies));
     m_spin->SetRange(kCopiesMin, kCopiesMax);
-    long copies = kCopiesMin;
-    m_copies->GetValue().ToLong(&copies);
-    m_spin->SetValue(std::clamp(static_cast<int>(copies), kCopiesMin, kCopiesMax));
+    m_spin->SetValue(copies);
     m_spin->Bind(wxEVT_SPIN, [this](wxSpinEvent& event) {
         m_copies->ChangeValue(std::to_string(event.GetPosition()));
     });
+    TranslateBurnLabels();
+    DressBurnLabels();
+}
+
+wxChoice* COutputPanelWnd::RecorderBox() {
+    MakeBurnControls();
+    return m_recorder;
+}
+
+wxChoice* COutputPanelWnd::SpeedBox() {
+    MakeBurnControls();
+    return m_speed;
 }
 
 const char* COutputPanelWnd::FolderKey(int mode) {
@@ -192,6 +209,9 @@ void COutputPanelWnd::OpenFolder() {
 
 int COutputPanelWnd::GetCopies() const {
     long copies = 0;
+    if (m_copies == nullptr) {
+        return std::clamp(GetAppConfig().GetInt("burncopies"), kCopiesMin, kCopiesMax);
+    }
     if (!m_copies->GetValue().ToLong(&copies)) {
         return kCopiesMin;
     }
@@ -219,11 +239,32 @@ void COutputPanelWnd::OnLanguageChanged() {
     m_destinationLabel->SetLabel("Destination:");
     m_browse->SetLabel("Browse...");
     m_open->SetLabel("Open");
+    TranslateBurnLabels();
+    TranslateWindow(*this, kOutputPanelDialogId);
+    RecalcLayout();
+}
+
+void COutputPanelWnd::TranslateBurnLabels() {
+    if (m_recorderLabel == nullptr) {
+        return;
+    }
     m_recorderLabel->SetLabel("CD Recorder:");
     m_speedLabel->SetLabel("Burn Speed:");
     m_copiesLabel->SetLabel("Burn Copies:");
     TranslateWindow(*this, kOutputPanelDialogId);
-    RecalcLayout();
+}
+
+void COutputPanelWnd::DressBurnLabels() {
+    if (m_recorderLabel == nullptr || m_skin.GetDir().empty()) {
+        return;
+    }
+    const wxFont font = MakeSkinFont(m_skin.GetFont(GetSkinSection()));
+    const wxColour text = NativeColour(m_skin.GetRgbColour("TextColor", 0, GetSkinSection()));
+    for (ImLabel* label : {m_recorderLabel, m_speedLabel, m_copiesLabel}) {
+        label->SetFont(font);
+        label->SetTextColour(text);
+        label->SetBgColor(m_look.childBg);
+    }
 }
 
 bool COutputPanelWnd::OnSkinChanged(const std::string& skinDir) {
@@ -237,11 +278,10 @@ bool COutputPanelWnd::OnSkinChanged(const std::string& skinDir) {
     for (int i = 0; i < 4; ++i) {
         colours[i] = NativeColour(m_skin.GetRgbColour(kColourKeys[i], 0, section));
     }
-    for (ImLabel* label : {m_destinationLabel, m_recorderLabel, m_speedLabel, m_copiesLabel}) {
-        label->SetFont(font);
-        label->SetTextColour(text);
-        label->SetBgColor(m_look.childBg);
-    }
+    m_destinationLabel->SetFont(font);
+    m_destinationLabel->SetTextColour(text);
+    m_destinationLabel->SetBgColor(m_look.childBg);
+    DressBurnLabels();
     for (ImButton* button : {m_browse, m_open}) {
         button->SetPicture(LoadSkinPicture("OutputBtn.bmp"));
         button->SetFont(font);
@@ -253,12 +293,12 @@ bool COutputPanelWnd::OnSkinChanged(const std::string& skinDir) {
 
 void COutputPanelWnd::DoRecalcLayout() {
     ImSkinDialog::DoRecalcLayout();
-    if (m_copies == nullptr) {
+    if (m_directory == nullptr) {
         return;
     }
     const bool burn = m_showType == 2;
     if (burn) {
-        MakeCopiesSpin();
+        MakeBurnControls();
     }
     const wxSize client = GetClientSize();
     const int height = m_rowHeight;
@@ -277,7 +317,9 @@ void COutputPanelWnd::DoRecalcLayout() {
         }
     }
     for (ImLabel* label : {m_destinationLabel, m_recorderLabel, m_speedLabel, m_copiesLabel}) {
-        FitLabel(label);
+        if (label != nullptr) {
+            FitLabel(label);
+        }
     }
     for (ImButton* button : {m_browse, m_open}) {
         FitIconButton(*button, height);

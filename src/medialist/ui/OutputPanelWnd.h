@@ -47,8 +47,9 @@ public:
     // The folder that Open shows in the current mode.
     std::string FolderToOpen() const;
 
-    wxChoice* RecorderBox() const { return m_recorder; }
-    wxChoice* SpeedBox() const { return m_speed; }
+    // The burn mode's lists, made on the first call.
+    wxChoice* RecorderBox();
+    wxChoice* SpeedBox();
     int GetCopies() const;
 
     void OnLanguageChanged() override;
@@ -57,7 +58,9 @@ public:
 
 private:
     void CreateControls();
-    void MakeCopiesSpin();
+    void MakeBurnControls();
+    void TranslateBurnLabels();
+    void DressBurnLabels();
     void ShowModeFolder();
     void UpdateDirectoryCopy();
     static const char* FolderKey(int mode);
