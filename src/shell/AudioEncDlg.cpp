@@ -137,21 +137,25 @@ void CAudioEncDlg::OnInitDialog() {
         });
     }
     SetMainHub(this);
-    wxIconBundle icons;
-    for (int size : {16, 32, 48}) {
-        wxIcon icon;
-        icon.CopyFromBitmap(MakeProgramIcon(size));
-        icons.AddIcon(icon);
-    }
-    SetIcons(icons);
     ShowCaption(true);
     GetSkinMenuBar(true);
     CreatePanels();
 
     g_Skin.ChooseStartSkin(GetAppConfig().GetString("last_skin"));
+    const wxBitmap smallIcon = MakeProgramIcon(16);
     if (ImCaptionBar* caption = GetCaptionBar()) {
-        caption->SetSmallIcon(MakeProgramIcon(16));
+        caption->SetSmallIcon(smallIcon);
     }
+    // The window manager's larger icons are not needed to paint the window: they follow it.
+    CallAfter([this, smallIcon] {
+        wxIconBundle icons;
+        for (int size : {16, 32, 48}) {
+            wxIcon icon;
+            icon.CopyFromBitmap(size == 16 ? smallIcon : MakeProgramIcon(size));
+            icons.AddIcon(icon);
+        }
+        SetIcons(icons);
+    });
     int mode = GetAppConfig().GetInt("last_run_function");
     if (mode < 0 || mode > 2) {
         mode = 0;
