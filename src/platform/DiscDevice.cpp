@@ -10,6 +10,7 @@
 #include <algorithm>
 #include <cctype>
 #include <cstdio>
+#include <cstdlib>
 #include <filesystem>
 #include <fstream>
 #include <iterator>
@@ -37,8 +38,14 @@ void InitLibcdio() {
     std::call_once(once, [] {
         // The default handler writes every warning to stderr: a poll once a second of a drive
         // without a disc, or of an image whose .bin went, would fill the terminal. Failures
-        // reach the caller as return values instead.
-        cdio_loglevel_default = CDIO_LOG_ASSERT;
+        // reach the caller as return values instead; only a broken assertion is told (and
+        // ends the program, as libcdio's own handler does).
+        cdio_log_set_handler([](cdio_log_level_t level, const char message[]) {
+            if (level >= CDIO_LOG_ASSERT) {
+                std::fprintf(stderr, "libcdio: %s\n", message);
+                std::abort();
+            }
+        });
         cdio_init();
     });
 }

@@ -48,6 +48,32 @@ TEST_F(MainWindowTest, TheMediaLibrariesComeWithTheFirstFileNotWithTheWindow) {
     EXPECT_TRUE(program.WaitForExit());
 }
 
+// The disc libraries come with the first call that needs them: the Rip tab reads the drives
+// through libcdio, the Burn tab lists recorders through libburn.
+TEST_F(MainWindowTest, TheDiscLibrariesComeWithTheirTabs) {
+    const auto mapped = [](pid_t pid, const char* library) {
+        const std::string maps = Program::Slurp("/proc/" + std::to_string(pid) + "/maps");
+        return maps.find(library) != std::string::npos;
+    };
+    Program program(m_home);
+    ASSERT_FALSE(program.WaitShown().empty());
+    for (const char* library : {"libcdio", "libburn", "libisofs", "libuchardet"}) {
+        EXPECT_FALSE(mapped(program.Pid(), library)) << library << " came with the window";
+    }
+    program.Send("tab 1");
+    program.WaitFor([](const State& s) { return s.at("mode") == "1" && s.count("ripdrives") > 0; });
+    EXPECT_TRUE(mapped(program.Pid(), "libcdio"));
+    EXPECT_FALSE(mapped(program.Pid(), "libburn"));
+    program.Send("tab 2");
+    const State state = program.WaitFor([](const State& s) {
+        return s.at("mode") == "2" && s.count("burnrecorders") > 0;
+    });
+    EXPECT_EQ(state.at("burnrecorders"), "1") << "the image recorder at least";
+    EXPECT_TRUE(mapped(program.Pid(), "libburn"));
+    program.Send("close");
+    EXPECT_TRUE(program.WaitForExit());
+}
+
 TEST_F(MainWindowTest, FirstStartIsCentredAtItsDefaultSizeAndClosingRemembersThePlace) {
     {
         Program program(m_home);
