@@ -128,6 +128,7 @@ private:
     mutable std::vector<PropertyNode*> m_rows;
     mutable bool m_rowsDirty = true;
     bool m_rebuiltSincePaint = false;
+    bool m_scrollBarStale = false;
     int m_topRow = 0;
 
     PropertyNode* m_selection = nullptr;

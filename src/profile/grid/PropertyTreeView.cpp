@@ -110,6 +110,10 @@ wxRect PropertyTree::FoldSignRect(const PropertyNode* node, const wxRect& row) c
 // --- painting
 
 void PropertyTree::OnPaint(wxPaintEvent&) {
+    if (m_scrollBarStale) {
+        m_scrollBarStale = false;
+        CallAfter([this] { UpdateScrollBar(); });  // not from inside a paint
+    }
     wxAutoBufferedPaintDC dc(this);
     dc.SetBackground(wxBrush(m_background));
     dc.Clear();
@@ -408,6 +412,13 @@ void PropertyTree::UpdateScrollBar() {
     const int count = static_cast<int>(VisibleNodes().size());
     const int page = PageRows();
     m_topRow = std::clamp(m_topRow, 0, std::max(0, count - page));
+    // GTK's scroll bar is dear to set, and a profile fills the grid a row at a time: out of
+    // sight (the simple side bar, the start) it is set once, when the grid next paints.
+    if (!IsShownOnScreen()) {
+        m_scrollBarStale = true;
+        return;
+    }
+    m_scrollBarStale = false;
     // GTK complains about a scroll bar laid out in less than a row before the first layout.
     if (GetClientSize().GetHeight() < RowHeight()) {
         SetScrollbar(wxVERTICAL, 0, 0, 0);

@@ -289,6 +289,24 @@ TEST_F(PropertiesCtrlTest, SelectingARowBelowTheFoldScrollsItIntoView) {
     EXPECT_EQ(m_grid->Tree()->GetScrollPos(wxVERTICAL), 0);
 }
 
+// Rows added out of sight leave the scroll bar alone until the grid shows; then it spans them.
+TEST_F(PropertiesCtrlTest, AGridFilledWhileHiddenSetsItsScrollBarWhenItShows) {
+    m_grid->Hide();
+    for (int id = 200; id < 260; ++id) {
+        m_grid->AddItem(m_tags, id, "Row " + std::to_string(id), PropertyKind::Int, "0", "", "edit");
+    }
+    const int rows = static_cast<int>(m_grid->VisibleRows().size());
+    m_grid->Show();
+    m_grid->Tree()->Update();
+    for (int i = 0; i < 2000 && m_grid->Tree()->GetScrollRange(wxVERTICAL) != rows; ++i) {
+        wxTheApp->ProcessPendingEvents();
+        wxTheApp->Yield(true);
+    }
+    EXPECT_EQ(m_grid->Tree()->GetScrollRange(wxVERTICAL), rows);
+    m_grid->Select(m_grid->FindById(259));
+    EXPECT_GT(m_grid->Tree()->GetScrollPos(wxVERTICAL), 0);
+}
+
 TEST_F(PropertiesCtrlTest, ClicksSelectFoldAndOpenTheEditor) {
     wxWindow* tree = m_grid->Tree();
     Mouse(tree, wxEVT_LEFT_DOWN, 40, RowMiddle(m_audio), true);
