@@ -115,6 +115,7 @@ void CSideBarWnd::AddLoadedProfile(std::unique_ptr<Profile> profile) {
     const std::string text = SelectorEntryText(*profile);
     m_catalogue.Add(std::move(profile));
     m_profileSelector->Append(wxString::FromUTF8(text));
+    m_selectorBest = wxDefaultSize;
 }
 
 void CSideBarWnd::OnFirstProfile(std::unique_ptr<Profile> profile) {
@@ -150,9 +151,18 @@ void CSideBarWnd::AdjustDropDownWidth() {
                       2 * std::max(0, wxSystemSettings::GetMetric(wxSYS_EDGE_X));
 }
 
+// wxChoice measures every entry each time it is asked its best size; the main window asks at
+// every layout, so the answer is kept until the entries change.
+wxSize CSideBarWnd::SelectorBestSize() const {
+    if (m_selectorBest == wxDefaultSize) {
+        m_selectorBest = m_profileSelector->GetBestSize();
+    }
+    return m_selectorBest;
+}
+
 int CSideBarWnd::NeededWidth() const {
     const wxSize save = m_saveButton->FitSize();
-    return m_metrics.LeftMargin + m_profileSelector->GetBestSize().x + m_metrics.HSpacing +
+    return m_metrics.LeftMargin + SelectorBestSize().x + m_metrics.HSpacing +
            std::max(save.x, 28) + m_metrics.RightMargin;
 }
 
@@ -162,6 +172,7 @@ void CSideBarWnd::RebuildSelectorTexts() {
     for (const std::string& text : m_catalogue.EntryTexts()) {
         m_profileSelector->Append(wxString::FromUTF8(text));
     }
+    m_selectorBest = wxDefaultSize;
     if (selected != wxNOT_FOUND && selected < static_cast<int>(m_profileSelector->GetCount())) {
         m_profileSelector->SetSelection(selected);
     }
@@ -314,6 +325,7 @@ void CSideBarWnd::SaveProfile(bool saveAs) {
         if (result == CatalogueResult::Ok) {
             m_profileSelector->Append(
                 wxString::FromUTF8(SelectorEntryText(*m_catalogue.At(m_catalogue.Count() - 1))));
+            m_selectorBest = wxDefaultSize;
         }
     } else {
         result = m_catalogue.Save(index, *working);
@@ -340,6 +352,7 @@ void CSideBarWnd::RenameProfile() {
     }
     m_profileSelector->Delete(static_cast<unsigned>(index));
     m_profileSelector->Append(wxString::FromUTF8(SelectorEntryText(*selected)));
+    m_selectorBest = wxDefaultSize;
     SelectIndex(newIndex, true);
 }
 
@@ -357,6 +370,7 @@ void CSideBarWnd::DeleteProfile() {
         return;
     }
     m_profileSelector->Delete(static_cast<unsigned>(index));
+    m_selectorBest = wxDefaultSize;
     SelectIndex(next, true);
 }
 
@@ -373,7 +387,7 @@ std::string CSideBarWnd::DescribeState() const {
     out << "profiles=" << m_catalogue.Count() << "\n";
     // 1 when the closed selector shows its longest entry whole.
     out << "selectorfits="
-        << (m_profileSelector->GetSize().x >= m_profileSelector->GetBestSize().x ? 1 : 0) << "\n";
+        << (m_profileSelector->GetSize().x >= SelectorBestSize().x ? 1 : 0) << "\n";
     out << "profiles_list=";
     for (unsigned i = 0; i < m_profileSelector->GetCount(); ++i) {
         out << "|" << m_profileSelector->GetString(i).utf8_string();

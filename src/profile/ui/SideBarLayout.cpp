@@ -131,7 +131,7 @@ void CSideBarWnd::DoRecalcLayout() {
     y += rowHeight + m_metrics.VSpacing;
 
     const wxSize saveSize = buttonSize(m_saveButton, wxSize(28, 26));
-    const int selectorHeight = std::max(saveSize.y, m_profileSelector->GetBestSize().y);
+    const int selectorHeight = std::max(saveSize.y, SelectorBestSize().y);
     const int selectorWidth = std::max(20, width - saveSize.x - m_metrics.HSpacing);
     m_profileSelector->SetSize(left, y, selectorWidth, selectorHeight);
     if (m_discType != nullptr)
@@ -161,7 +161,10 @@ void CSideBarWnd::LayoutSimpleGroup(int x, int y, int width) {
     }
     m_channelsLabel->SetSize(x, y, width, kLabelHeight);
     y += kLabelHeight;
-    m_channels->SetSize(x, y, width, std::max(kEditHeight, m_channels->GetBestSize().y));
+    if (m_channelsHeight == 0) {
+        m_channelsHeight = std::max(kEditHeight, m_channels->GetBestSize().y);
+    }
+    m_channels->SetSize(x, y, width, m_channelsHeight);
     y += m_channels->GetSize().y + 2 * gap;
     if (m_volumeName == nullptr)
         return;

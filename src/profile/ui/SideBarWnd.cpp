@@ -95,7 +95,8 @@ void CSideBarWnd::CreateControls() {
     m_profileLabel = new ImLabel(this, kProfileLabel, "Profile:");
     m_advancedButton = new ImButton(this, kAdvanced, "Advanced");
     m_simpleButton = new ImButton(this, kSimple, "Simple");
-    m_profileSelector = new wxChoice(this, kProfileSelector);
+    // Sized at birth: a native list asked for its best size measures its every entry.
+    m_profileSelector = new wxChoice(this, kProfileSelector, wxDefaultPosition, wxSize(40, 20));
     m_saveButton = new ImButton(this, kSaveProfile, "SaveProfile");
     // The skin draws this one as a menu glyph; its words would not fit beside the selector.
     m_saveButton->SetTextShown(false);
@@ -108,7 +109,7 @@ void CSideBarWnd::CreateControls() {
     m_volumeLabel = new ImLabel(this, kVolumeLabel, "Volume:");
     m_volumeSlider = new ImTickSlider(this, kVolumeSlider);
     m_channelsLabel = new ImLabel(this, kChannelsLabel, "Channels:");
-    m_channels = new wxChoice(this, kChannels);
+    m_channels = new wxChoice(this, kChannels, wxDefaultPosition, wxSize(40, 20));
     m_simpleGroup = {m_bitRateLabel, m_bitRateSlider, m_sampleRateLabel, m_sampleRateSlider,
                      m_volumeLabel,  m_volumeSlider,  m_channelsLabel,   m_channels};
 

@@ -138,6 +138,7 @@ private:
     void UpdateEnabling();
     void LayoutSimpleGroup(int x, int y, int width);
     void LayoutDiscGroup(int x, int y, int width);
+    wxSize SelectorBestSize() const;
     void EnsureDiscControls();
     void TranslateLabels();
     void TranslateDiscControls();
@@ -169,6 +170,8 @@ private:
     std::vector<wxWindow*> m_discGroup;
     std::vector<ImLabel*> m_discLabels;
     wxChoice* m_interval = nullptr;
+    mutable wxSize m_selectorBest = wxDefaultSize;  // SelectorBestSize
+    int m_channelsHeight = 0;
     ImCheckBox* m_balance = nullptr;
 
     bool m_advanced = false;
