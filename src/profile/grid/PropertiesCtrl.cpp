@@ -117,7 +117,8 @@ PropertiesCtrl::PropertiesCtrl(wxWindow* parent, int id)
                wxBORDER_NONE | wxFULL_REPAINT_ON_RESIZE | wxCLIP_CHILDREN, "PropertiesCtrl"),
       m_impl(std::make_unique<Impl>()) {
     SetBackgroundStyle(wxBG_STYLE_PAINT);
-    SetCursor(wxCursor(wxCURSOR_ARROW));
+    // No cursor of its own until the mouse is over the grip: making one loads the cursor
+    // theme, a cost the start need not pay for a grid that is hidden at first.
     m_impl->commentBackground = wxSystemSettings::GetColour(wxSYS_COLOUR_BTNFACE);
     for (const EditorEntry& entry : kEditors) {
         m_impl->editors.push_back(std::make_unique<PropertyEditor>(entry.name, entry.style));

@@ -17,9 +17,30 @@ PropertyTree::PropertyTree(PropertiesCtrl* owner, int id)
       m_background(wxSystemSettings::GetColour(wxSYS_COLOUR_LISTBOX)),
       m_textColour(wxSystemSettings::GetColour(wxSYS_COLOUR_WINDOWTEXT)) {
     SetBackgroundStyle(wxBG_STYLE_PAINT);
+    BindViewEvents();
+}
+
+// The in-place editors are native boxes, made with the first editor opened: the side bar's
+// grid is hidden at the start and may never open one.
+void PropertyTree::EnsureEditors() {
+    if (m_edit != nullptr) {
+        return;
+    }
     m_edit = new InPlaceEdit(this, this);
     m_list = new InPlaceList(this);
-    BindViewEvents();
+    if (m_textColourSet) {
+        m_edit->SetForegroundColour(m_textColour);
+        m_list->EditWindow()->SetForegroundColour(m_textColour);
+    }
+    if (m_backgroundSet) {
+        m_edit->SetBackgroundColour(m_background);
+        m_list->EditWindow()->SetBackgroundColour(m_background);
+    }
+    m_edit->SetFont(TreeFont());
+    m_list->SetFont(TreeFont());
+    if (m_listLines > 0) {
+        m_list->SetListLines(m_listLines);
+    }
 }
 
 PropertyTree::~PropertyTree() {
@@ -211,6 +232,7 @@ void PropertyTree::MoveSelection(int delta) {
 
 void PropertyTree::OpenEditor(PropertyNode* node) {
     CloseEditor(true);
+    EnsureEditors();
     if (node == nullptr || node->item->IsCategory() || !node->item->enabled ||
         node->item->editor == nullptr || !Contains(node)) {
         return;
@@ -436,15 +458,21 @@ void PropertyTree::SetGridLineColor(const wxColour& colour) {
 
 void PropertyTree::SetTextColour(const wxColour& colour) {
     m_textColour = colour;
-    m_edit->SetForegroundColour(colour);
-    m_list->EditWindow()->SetForegroundColour(colour);
+    m_textColourSet = true;
+    if (m_edit != nullptr) {
+        m_edit->SetForegroundColour(colour);
+        m_list->EditWindow()->SetForegroundColour(colour);
+    }
     Refresh();
 }
 
 void PropertyTree::SetRowBackground(const wxColour& colour) {
     m_background = colour;
-    m_edit->SetBackgroundColour(colour);
-    m_list->EditWindow()->SetBackgroundColour(colour);
+    m_backgroundSet = true;
+    if (m_edit != nullptr) {
+        m_edit->SetBackgroundColour(colour);
+        m_list->EditWindow()->SetBackgroundColour(colour);
+    }
     Refresh();
 }
 
@@ -458,8 +486,10 @@ const wxFont& PropertyTree::TreeFont() const {
 void PropertyTree::SetTreeFont(const wxFont& font) {
     m_font = font;
     m_rowHeight = 0;
-    m_edit->SetFont(TreeFont());
-    m_list->SetFont(TreeFont());
+    if (m_edit != nullptr) {
+        m_edit->SetFont(TreeFont());
+        m_list->SetFont(TreeFont());
+    }
     RowsChanged();
 }
 
@@ -473,7 +503,10 @@ int PropertyTree::RowHeight() const {
 }
 
 void PropertyTree::SetListLines(int lines) {
-    m_list->SetListLines(lines);
+    m_listLines = lines;
+    if (m_list != nullptr) {
+        m_list->SetListLines(lines);
+    }
 }
 
 void PropertyTree::EnableToolTips(bool enable) {

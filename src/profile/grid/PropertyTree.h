@@ -119,6 +119,7 @@ private:
     void RebuildRows() const;
     void RowsChanged();
     void OpenEditor(PropertyNode* node);
+    void EnsureEditors();
     void CloseEditor(bool commit);
     void PlaceEditor();
     void AnnounceChange(PropertyNode* node);
@@ -135,8 +136,11 @@ private:
     PropertyNode* m_editorNode = nullptr;
     // Kept apart from the row: a client may point the row at another editor while it is open.
     InPlaceStyle m_openStyle = InPlaceStyle::None;
-    InPlaceEdit* m_edit = nullptr;
+    InPlaceEdit* m_edit = nullptr;  // both made by EnsureEditors
     InPlaceList* m_list = nullptr;
+    bool m_textColourSet = false;
+    bool m_backgroundSet = false;
+    int m_listLines = 0;
 
     int m_gutterWidth = kDefaultGutterWidth;
     int m_labelColumnWidth = kDefaultLabelColumnWidth;

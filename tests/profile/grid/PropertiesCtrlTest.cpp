@@ -289,6 +289,20 @@ TEST_F(PropertiesCtrlTest, SelectingARowBelowTheFoldScrollsItIntoView) {
     EXPECT_EQ(m_grid->Tree()->GetScrollPos(wxVERTICAL), 0);
 }
 
+// The in-place editors are made with the first editor opened, and wear the colours the grid
+// was given before that.
+TEST_F(PropertiesCtrlTest, EditorsAreMadeWhenFirstOpenedInTheGridsColours) {
+    EXPECT_TRUE(m_grid->Tree()->GetChildren().empty()) << "no native box before an editor opens";
+    m_grid->SetTextColour2(wxColour(0x20, 0x30, 0x40));
+    m_grid->SetBackgroundColour2(wxColour(0xF0, 0xE0, 0xD0), *wxWHITE);
+    m_grid->Select(m_bitrate);
+    wxTextCtrl* edit = m_grid->Tree()->OpenEditText();
+    ASSERT_NE(edit, nullptr);
+    EXPECT_EQ(edit->GetForegroundColour(), wxColour(0x20, 0x30, 0x40));
+    EXPECT_EQ(edit->GetBackgroundColour(), wxColour(0xF0, 0xE0, 0xD0));
+    EXPECT_FALSE(m_grid->Tree()->GetChildren().empty());
+}
+
 // Rows added out of sight leave the scroll bar alone until the grid shows; then it spans them.
 TEST_F(PropertiesCtrlTest, AGridFilledWhileHiddenSetsItsScrollBarWhenItShows) {
     m_grid->Hide();
