@@ -1,6 +1,8 @@
 #!/usr/bin/env bash
 # Start-up, resize repaint and list paint figures of the skinned main window. Runs its own Xvfb.
 # Usage: bench/skin_bench.sh [build-dir]   (needs the audio-converter and skin_paint_bench targets)
+# ROUNDS (default 11) rounds of the start, each the empty frame then the program; the medians
+# are compared: a start is tens of milliseconds and a shared machine's noise is a few.
 set -euo pipefail
 build=${1:-build}
 bin=$(cd "$build/bin" && pwd)
@@ -18,7 +20,8 @@ state() { sed -n "s/^$1=//p" "$hook/state.txt" 2>/dev/null; }
 
 median() { sort -n | awk '{v[NR]=$1} END {if (NR % 2) print v[(NR+1)/2]; else print (v[NR/2]+v[NR/2+1])/2}'; }
 : > "$home/program.log"; : > "$home/empty.log"
-for run in 1 2 3 4 5; do
+rounds=${ROUNDS:-11}
+for run in $(seq "$rounds"); do
   # The floor first, then the program: the same machine state for both sides of a round.
   start=$(date +%s%3N)
   painted=$("$bin/empty_frame_bench" | sed -n 's/^firstpaint_ms //p')
@@ -30,7 +33,7 @@ for run in 1 2 3 4 5; do
   until [ -n "$(state firstpaint_ms)" ] && [ "$(state firstpaint_ms)" != 0 ]; do sleep 0.01; done
   echo $(( $(state firstpaint_ms) - start )) >> "$home/program.log"
   echo "startup_to_first_paint_ms $(tail -1 "$home/program.log") (empty frame $(tail -1 "$home/empty.log"))"
-  if [ "$run" = 5 ]; then
+  if [ "$run" = "$rounds" ]; then
     echo "benchresize 100" > "$hook/command.txt"
     until [ -n "$(state resize_ms)" ] && [ "$(state resize_ms)" != 0 ]; do sleep 0.05; done
     echo "resize_repaint_ms_per_step $(state resize_ms)"
