@@ -117,10 +117,14 @@ void ImLabel::OnPaint(wxPaintEvent& /*event*/) {
     const int sampleHeight = dc.GetTextExtent("ZjgiIPq").y;
     int y = m_lines.size() == 1 ? (size.y - sampleHeight) / 2 : 1;
     for (const wxString& line : m_lines) {
-        const wxString shown = m_lines.size() == 1
-                                   ? wxControl::Ellipsize(line, dc, wxELLIPSIZE_MIDDLE, size.x - 4)
-                                   : line;
-        const int width = dc.GetTextExtent(shown).x;
+        // Shortening measures the text a character at a time: only a line too long for the
+        // label pays for it.
+        wxString shown = line;
+        int width = dc.GetTextExtent(line).x;
+        if (m_lines.size() == 1 && width > size.x - 4) {
+            shown = wxControl::Ellipsize(line, dc, wxELLIPSIZE_MIDDLE, size.x - 4);
+            width = dc.GetTextExtent(shown).x;
+        }
         int x = 2;
         if (m_alignment & wxALIGN_CENTER_HORIZONTAL) {
             x = (size.x - width) / 2;

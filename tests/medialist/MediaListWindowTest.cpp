@@ -417,6 +417,38 @@ TEST_F(MediaListWindowTest, SkinnedButtonRowStandsAroundEncode) {
     EXPECT_GT(m_list->List()->Columns()[kColStatus].width, dc.GetTextExtent("Unknown file").x);
 }
 
+// German's words are too long for the row at the design width: Add, Remove and Clear give up
+// theirs first (keeping them as tool tips), Encode, Pause and Stop keep theirs, and no button
+// runs past the row's ends. English at the same width keeps every word.
+TEST_F(MediaListWindowTest, LongWordsLeaveTheRowAsToolTipsNotPastItsEnd) {
+    g_Skin.SetRoot(std::string(AC_BIN_DIR) + "\\Skin");
+    ASSERT_TRUE(g_Skin.SetSkin("Default"));
+    for (const char* language : {"German", "English"}) {
+        ASSERT_TRUE(g_Language.Init(AC_BIN_DIR, language));
+        m_list->OnLanguageChanged();
+        m_list->SetSize(0, 0, 600, 400);
+        m_list->SetSize(0, 0, 601, 400);  // a size event for sure
+        const int rowLeft = m_list->FindWindow(1225)->GetRect().GetRight();
+        const int rowRight = m_list->FindWindow(1226)->GetRect().x;
+        int previousRight = rowLeft;
+        for (int id : {1002, 1003, 1004, 1034, 1009, 1012}) {
+            const wxRect button = m_list->FindWindow(id)->GetRect();
+            EXPECT_GT(button.x, previousRight) << language << " " << id;
+            previousRight = button.GetRight();
+        }
+        EXPECT_LT(previousRight, rowRight) << language;
+        const bool german = std::string(language) == "German";
+        for (int id : {1002, 1003, 1004}) {
+            wxWindow* button = m_list->FindWindow(id);
+            EXPECT_EQ(button->GetToolTipText(), german ? button->GetLabel() : wxString())
+                << language << " " << id;
+        }
+        for (int id : {1034, 1009, 1012}) {
+            EXPECT_EQ(m_list->FindWindow(id)->GetToolTipText(), wxString()) << language << " " << id;
+        }
+    }
+}
+
 TEST_F(MediaListWindowTest, OutputPanelKeepsAFolderPerModeAndTrimsIt) {
     const std::string music = s_home + "/Music";
     EXPECT_TRUE(fs::is_directory(music)) << "the default folder is made at start";

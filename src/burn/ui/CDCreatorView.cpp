@@ -354,25 +354,11 @@ void CCDCreatorPanel::DoRecalcLayout() {
     const wxSize client = GetClientSize();
     const int room =
         client.x - 2 * m_endSpacing - m_leftEnd->GetSize().x - m_rightEnd->GetSize().x - 8;
-    std::array<wxSize, 7> sizes;
-    // Words beside the glyphs while the row has room for them: first the arrows of the two moves
-    // go without theirs, then the list's own Add, Remove and Clear (German's words are long),
-    // then Burn and Stop too; each keeps its word as a tool tip.
+    // First the arrows of the two moves go without their words, then the list's own Add,
+    // Remove and Clear, then Burn and Stop too.
+    static constexpr int kWordlessFrom[7] = {2, 2, 2, 3, 3, 1, 1};
+    const std::vector<wxSize> sizes = FitButtonRowWords(m_buttons, kWordlessFrom, room, 6, 24);
     int tallest = std::max(m_leftEnd->GetSize().y, m_rightEnd->GetSize().y);
-    for (int wordless = 0; wordless <= 3; ++wordless) {
-        int total = 6 * 6;
-        for (std::size_t i = 0; i < kButtons.size(); ++i) {
-            const bool hide = wordless == 3 || (wordless >= 1 && i >= 5) ||
-                              (wordless >= 2 && i < kBurnButton);
-            m_buttons[i]->SetTextShown(!hide);
-            m_buttons[i]->SetToolTip(hide ? m_buttons[i]->GetLabel() : wxString());
-            FitIconButton(*m_buttons[i], 24);
-            sizes[i] = m_buttons[i]->GetSize();
-            total += sizes[i].x;
-        }
-        if (total <= room)
-            break;
-    }
     for (const wxSize& size : sizes)
         tallest = std::max(tallest, size.y);
     const int rowHeight = std::max(tallest, std::min(m_buttonRowHeight, tallest + 16));

@@ -357,12 +357,15 @@ void CMediaListWnd::DoRecalcLayout() {
         return;
     }
     const wxSize client = GetClientSize();
-    std::array<wxSize, 6> sizes;
+    // Add, Remove and Clear go without their words first when a translation is too long for
+    // the row, then Encode, Pause and Stop too.
+    static constexpr int kWordlessFrom[6] = {1, 1, 1, 2, 2, 2};
+    const int room = client.x - 2 * m_endSpacing - m_leftEnd->GetSize().x -
+                     m_rightEnd->GetSize().x - 8;
+    const std::vector<wxSize> sizes = FitButtonRowWords(m_buttons, kWordlessFrom, room, 6, 24);
     int rowHeight = std::max(m_leftEnd->GetSize().y, m_rightEnd->GetSize().y);
-    for (std::size_t i = 0; i < kButtons.size(); ++i) {
-        FitIconButton(*m_buttons[i], 24);
-        sizes[i] = m_buttons[i]->GetSize();
-        rowHeight = std::max(rowHeight, sizes[i].y);
+    for (const wxSize& size : sizes) {
+        rowHeight = std::max(rowHeight, size.y);
     }
     const int rowTop = client.y - m_metrics.BottomMargin - rowHeight;
     const wxSize left = m_leftEnd->GetSize();
