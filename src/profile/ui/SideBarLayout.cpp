@@ -22,6 +22,7 @@ namespace {
 
 constexpr int kLabelHeight = 18;
 constexpr int kSliderHeight = 24;
+constexpr int kCompactSliderHeight = 20;
 constexpr int kEditHeight = 26;
 constexpr int kSkinColourNotSet = 255;
 
@@ -151,26 +152,53 @@ void CSideBarWnd::LayoutSimpleGroup(int x, int y, int width) {
     const std::pair<ImLabel*, ImTickSlider*> rows[] = {{m_bitRateLabel, m_bitRateSlider},
                                                        {m_sampleRateLabel, m_sampleRateSlider},
                                                        {m_volumeLabel, m_volumeSlider}};
-    // The column under the player is short: the rows keep a third of the skin's spacing.
-    const int gap = m_metrics.VSpacing / 3;
-    for (const auto& [label, slider] : rows) {
-        label->SetSize(x, y, width, kLabelHeight);
-        y += kLabelHeight;
-        slider->SetSize(x, y, width, kSliderHeight);
-        y += kSliderHeight + gap;
-    }
-    m_channelsLabel->SetSize(x, y, width, kLabelHeight);
-    y += kLabelHeight;
     if (m_channelsHeight == 0) {
         m_channelsHeight = std::max(kEditHeight, m_channels->GetBestSize().y);
     }
-    m_channels->SetSize(x, y, width, m_channelsHeight);
-    y += m_channels->GetSize().y + 2 * gap;
-    if (m_volumeName == nullptr)
+    // The column under the player is short: the rows keep a third of the skin's spacing. A data
+    // disc's name below the channels does not fit at the design size: then the two labels go
+    // beside their boxes, as the audio disc's do, and the sliders close up, so the name stays
+    // in sight.
+    int gap = m_metrics.VSpacing / 3;
+    int sliderHeight = kSliderHeight;
+    const int room = GetClientSize().y - m_metrics.BottomMargin - y;
+    const int stacked = 3 * (kLabelHeight + kSliderHeight + gap) + 2 * kLabelHeight +
+                        m_channelsHeight + 2 * gap + kEditHeight;
+    const bool compact = m_volumeName != nullptr && m_volumeName->IsShown() && stacked > room;
+    if (compact) {
+        gap = 1;
+        sliderHeight = kCompactSliderHeight;
+    }
+    for (const auto& [label, slider] : rows) {
+        label->SetSize(x, y, width, kLabelHeight);
+        y += kLabelHeight;
+        slider->SetSize(x, y, width, sliderHeight);
+        y += sliderHeight + gap;
+    }
+    if (!compact) {
+        m_channelsLabel->SetSize(x, y, width, kLabelHeight);
+        y += kLabelHeight;
+        m_channels->SetSize(x, y, width, m_channelsHeight);
+        y += m_channelsHeight + 2 * gap;
+        if (m_volumeName != nullptr) {
+            m_volumeNameLabel->SetSize(x, y, width, kLabelHeight);
+            y += kLabelHeight;
+            m_volumeName->SetSize(x, y, width, kEditHeight);
+        }
         return;
-    m_volumeNameLabel->SetSize(x, y, width, kLabelHeight);
-    y += kLabelHeight;
-    m_volumeName->SetSize(x, y, width, kEditHeight);
+    }
+    int labelWidth = 0;
+    for (ImLabel* label : {m_channelsLabel, m_volumeNameLabel}) {
+        labelWidth = std::max(labelWidth, label->GetTextExtent(label->GetLabel()).x);
+    }
+    labelWidth = std::min(labelWidth + m_metrics.HSpacing, width / 2);
+    const int boxWidth = std::max(20, width - labelWidth);
+    m_channelsLabel->SetSize(x, y + (m_channelsHeight - kLabelHeight) / 2, labelWidth,
+                             kLabelHeight);
+    m_channels->SetSize(x + labelWidth, y, boxWidth, m_channelsHeight);
+    y += m_channelsHeight + gap;
+    m_volumeNameLabel->SetSize(x, y + (kEditHeight - kLabelHeight) / 2, labelWidth, kLabelHeight);
+    m_volumeName->SetSize(x + labelWidth, y, boxWidth, kEditHeight);
 }
 
 void CSideBarWnd::LayoutDiscGroup(int x, int y, int width) {
@@ -234,9 +262,10 @@ void CSideBarWnd::ShowGroup(const std::vector<wxWindow*>& group, bool show) {
 }
 
 void CSideBarWnd::ShowVolumeName(bool show) {
-    if (m_volumeName != nullptr) {
+    if (m_volumeName != nullptr && m_volumeName->IsShown() != show) {
         m_volumeNameLabel->Show(show);
         m_volumeName->Show(show);
+        RecalcLayout();  // the simple group closes up around it
     }
 }
 

@@ -437,6 +437,25 @@ TEST_F(SideBarSets, TheDiscGroupFitsUnderThePlayerAndTheSlidersHoldStillDuringAB
     EXPECT_LT(m_bar->FindWindow(sidebar::kAlbumLabel)->GetRect().GetBottom(),
               m_bar->FindWindow(sidebar::kAlbum)->GetRect().GetTop());
 
+    // An MP3 CD shows the disc's name under the profile's controls: at the design height the
+    // sliders close up and the labels go beside their boxes, and the name stays in the bar.
+    m_bar->SelectDiscType(1);
+    m_bar->SetSize(230, 251);
+    m_bar->SetSize(230, 250);
+    ASSERT_FALSE(m_bar->IsAdvanced());
+    const wxRect small(wxPoint(0, 0), m_bar->GetClientSize());
+    for (int id : {sidebar::kVolumeNameLabel, sidebar::kVolumeName, sidebar::kChannels,
+                   sidebar::kVolumeSlider}) {
+        wxWindow* control = m_bar->FindWindow(id);
+        EXPECT_TRUE(control->IsShown()) << id;
+        EXPECT_TRUE(small.Contains(control->GetRect())) << id << " lies outside the bar";
+    }
+    EXPECT_FALSE(m_bar->FindWindow(sidebar::kVolumeName)
+                     ->GetRect()
+                     .Intersects(m_bar->FindWindow(sidebar::kVolumeNameLabel)->GetRect()));
+    m_bar->SelectDiscType(0);
+    m_bar->SetSize(230, 600);
+
     m_bar->UpdateWindowUI();
     EXPECT_TRUE(m_bar->FindWindow(sidebar::kSampleRateSlider)->IsEnabled());
     m_hub.burning = true;
