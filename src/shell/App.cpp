@@ -10,6 +10,8 @@
 #include "shell/AppConfig.h"
 #include "shell/AudioEncDlg.h"
 #include "shell/TestHook.h"
+#include "skin/SkinManager.h"
+#include "skin/SkinPicture.h"
 
 #include <wx/snglinst.h>
 #include <wx/wx.h>
@@ -136,6 +138,10 @@ public:
                          wxString::FromUTF8(product.productFullName), wxOK | wxICON_WARNING);
         }
 
+        // The start skin's pictures are decoded on a second core while the window is made.
+        std::string skin = config.GetString("last_skin");
+        ac::PrefetchSkinPictures(ac::g_Language.GetBaseDir() + "\\Skin\\" +
+                                 ac::SkinNameOf(skin.empty() ? std::string("Default") : skin));
         wxInitAllImageHandlers();
         auto* dialog = new ac::CAudioEncDlg();
         SetTopWindow(dialog);
@@ -156,6 +162,7 @@ public:
     }
 
     int OnExit() override {
+        ac::FinishSkinPrefetch();
         ReleaseSettingsWrites();
         m_listener.Stop();
         m_instance.reset();

@@ -89,6 +89,29 @@ void ImSkinManager::DressLateListener(ImSkinListener* listener) {
     listener->OnSkinChanged(m_strSkinDir);
 }
 
+namespace {
+
+bool s_managerGone = false;  // a listener that outlives the global has nothing to leave
+
+}  // namespace
+
+ImSkinListener::~ImSkinListener() {
+    if (!s_managerGone) {
+        g_Skin.RemoveListener(this);
+    }
+}
+
+ImSkinManager::~ImSkinManager() {
+    if (this == &g_Skin) {
+        s_managerGone = true;
+    }
+}
+
+void ImSkinManager::RemoveListener(ImSkinListener* listener) {
+    std::erase(m_listeners, listener);
+    std::erase(m_deferred, listener);
+}
+
 bool ImSkinManager::AddListener(ImSkinListener* listener) {
     if (listener == nullptr ||
         std::find(m_listeners.begin(), m_listeners.end(), listener) != m_listeners.end()) {

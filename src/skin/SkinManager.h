@@ -1,7 +1,7 @@
 #pragma once
 // The catalogue of skins in data.pkg and the current skin. Windows register once, at creation,
-// and are told of each change in the order they registered; they live as long as the main
-// window, so the list is never pruned.
+// and are told of each change in the order they registered; a window that goes leaves the list
+// as it goes.
 //
 // Thread contract: UI thread only.
 
@@ -13,7 +13,7 @@ namespace ac {
 
 class ImSkinListener {
 public:
-    virtual ~ImSkinListener() = default;
+    virtual ~ImSkinListener();
     // True when the window took the skin; false stops the round of notices.
     virtual bool OnSkinChanged(const std::string& skinDir) = 0;
     // True while the window is out of sight and would rather take the skin when it comes into
@@ -32,7 +32,10 @@ public:
     const std::string& GetSkinName() const { return m_strSkinName; }
     std::string GetImagePath(const class ImLanguage* language, std::string_view fileName) const;
 
+    ~ImSkinManager();
+
     bool AddListener(ImSkinListener* listener);
+    void RemoveListener(ImSkinListener* listener);
     // Hands a listener the skin it put off while out of sight; nothing when it put off none.
     void TakeDeferredSkin(ImSkinListener* listener);
     // Adds a listener made after the start and dresses it in the current skin.

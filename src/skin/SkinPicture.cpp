@@ -2,6 +2,7 @@
 
 #include "resources/Language.h"
 #include "resources/Package.h"
+#include "resources/ZipArchive.h"
 #include "skin/SkinManager.h"
 
 #include <wx/dcmemory.h>
@@ -10,7 +11,9 @@
 
 #include <algorithm>
 #include <cctype>
+#include <thread>
 #include <unordered_map>
+#include <vector>
 
 namespace ac {
 
@@ -26,7 +29,85 @@ bool EndsWithPng(const std::string& name) {
     return tail == "png";
 }
 
+std::string CacheKey(const std::string& path) {
+    std::string key = path;
+    std::transform(key.begin(), key.end(), key.begin(),
+                   [](unsigned char c) { return static_cast<char>(std::tolower(c)); });
+    return key;
+}
+
+bool EndsWithBmp(const std::string& name) {
+    return name.size() > 4 && CacheKey(name.substr(name.size() - 4)) == ".bmp";
+}
+
+// The pictures a thread decoded ahead, by lower-case path; read after the thread is joined.
+struct SkinPrefetch {
+    std::thread worker;
+    std::unordered_map<std::string, Bitmap24> pictures;
+    ~SkinPrefetch() {
+        if (worker.joinable()) {
+            worker.join();
+        }
+    }
+};
+
+SkinPrefetch& Prefetched() {
+    static SkinPrefetch prefetch;
+    return prefetch;
+}
+
+wxImage ImageOf(const Bitmap24& picture) {
+    wxImage image(picture.width, picture.height, false);
+    unsigned char* rgb = image.GetData();
+    for (const std::uint32_t pixel : picture.pixels) {
+        *rgb++ = static_cast<unsigned char>(pixel >> 16);
+        *rgb++ = static_cast<unsigned char>(pixel >> 8);
+        *rgb++ = static_cast<unsigned char>(pixel);
+    }
+    return image;
+}
+
 }  // namespace
+
+void PrefetchSkinPictures(const std::string& skinDir) {
+    SkinPrefetch& prefetch = Prefetched();
+    if (prefetch.worker.joinable()) {
+        return;
+    }
+    // The skin's own entries in its package; a skin in a plain folder gets no head start.
+    const std::string mapped = MapResourcePath(skinDir + "\\skin.ini");
+    const std::shared_ptr<ZipArchive> archive = OpenPackage(mapped);
+    if (archive == nullptr) {
+        return;
+    }
+    std::string prefix = CacheKey(GetEntryName(mapped));
+    prefix.erase(prefix.size() - std::string_view("skin.ini").size());
+    std::vector<std::string> paths;
+    for (const ZipEntry& entry : archive->Entries()) {
+        const std::string name = CacheKey(entry.name);
+        if (name.size() > prefix.size() && name.compare(0, prefix.size(), prefix) == 0 &&
+            name.find('\\', prefix.size()) == std::string::npos && EndsWithBmp(name)) {
+            paths.push_back(skinDir + "\\" + entry.name.substr(prefix.size()));
+        }
+    }
+    prefetch.worker = std::thread([&prefetch, paths = std::move(paths)] {
+        for (const std::string& path : paths) {
+            std::vector<unsigned char> bytes;
+            if (!ReadResource(path, bytes)) {
+                continue;
+            }
+            if (std::optional<Bitmap24> picture = DecodeBmp24(bytes)) {
+                prefetch.pictures.emplace(CacheKey(path), std::move(*picture));
+            }
+        }
+    });
+}
+
+void FinishSkinPrefetch() {
+    if (Prefetched().worker.joinable()) {
+        Prefetched().worker.join();
+    }
+}
 
 wxImage LoadImageResource(const std::string& path) {
     std::vector<unsigned char> bytes;
@@ -85,7 +166,13 @@ SkinPicture LoadSkinPicture(const std::string& fileName) {
     if (auto found = s_cache.find(path); found != s_cache.end()) {
         return found->second;
     }
-    if (EndsWithPng(fileName)) {
+    FinishSkinPrefetch();
+    std::unordered_map<std::string, Bitmap24>& prefetched = Prefetched().pictures;
+    if (auto ahead = prefetched.find(CacheKey(path)); ahead != prefetched.end()) {
+        picture.image = ImageOf(ahead->second);
+        picture.bitmap = wxBitmap(picture.image);
+        prefetched.erase(ahead);
+    } else if (EndsWithPng(fileName)) {
         wxImage image = LoadImageResource(path);
         if (image.IsOk()) {
             picture.image = image;

@@ -38,6 +38,12 @@ std::vector<SkinRect> LoadRegionResource(const std::string& path);
 // The image rule: a name ending in "png" (any case) keeps alpha, every other is a bitmap. The
 // name is relative to the current skin's directory and goes through the language's variant.
 SkinPicture LoadSkinPicture(const std::string& fileName);
+// Decodes the 24-bit BMPs of a skin folder on a thread of their own while the window is being
+// made; LoadSkinPicture takes them from there (waiting for the thread on its first call).
+// Only a head start: a picture the thread did not decode is decoded as ever.
+void PrefetchSkinPictures(const std::string& skinDir);
+// Waits for the prefetch thread; LoadSkinPicture's first call and the program's end do.
+void FinishSkinPrefetch();
 
 void DrawSplitPicture(wxDC& dc, const wxRect& target, const SkinPicture& picture, int splitRow,
                       int splitCol);

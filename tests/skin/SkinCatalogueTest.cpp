@@ -152,6 +152,22 @@ TEST_F(SkinCatalogueTest, AHiddenListenerTakesTheLatestSkinWhenShown) {
     EXPECT_EQ(log.size(), 3u) << "a shown listener hears every change again";
 }
 
+// A window that goes leaves the round: the next change of skin does not reach it.
+TEST_F(SkinCatalogueTest, AListenerThatGoesHearsNoMore) {
+    std::vector<std::string> log;
+    Recorder staying(log, "staying");
+    g_Skin.AddListener(&staying);
+    {
+        Recorder going(log, "going");
+        g_Skin.AddListener(&going);
+        going.hidden = true;
+        ASSERT_TRUE(g_Skin.SetSkin("Blue"));  // deferred: on the waiting list too
+    }
+    log.clear();
+    ASSERT_TRUE(g_Skin.SetSkin("Default"));
+    EXPECT_EQ(log, std::vector<std::string>{"staying:" + Logical("Skin\\Default")});
+}
+
 // A panel made after the start (a tab opened late) wears the skin chosen before it existed:
 // at once when shown, when it first shows when hidden.
 TEST_F(SkinCatalogueTest, AListenerMadeLateTakesTheCurrentSkin) {
