@@ -329,6 +329,11 @@ void COutputPanelWnd::DoRecalcLayout() {
         m_speed->SetSize(90, -1);
         LayoutRow(row, 0, gap, m_recorder,
                   {m_recorderLabel, m_recorder, m_speedLabel, m_speed, m_copiesLabel, m_copies, m_spin});
+        // GTK's spin button is never shorter than its theme allows and warns at every layout
+        // that tries: it keeps its own height, centred on the row.
+        const int spinHeight = std::max(height, m_spin->GetBestSize().y);
+        const wxRect spin = m_spin->GetRect();
+        m_spin->SetSize(spin.x, spin.y + (spin.height - spinHeight) / 2, spin.width, spinHeight);
     } else {
         LayoutRow(row, 0, gap, m_directory, {m_destinationLabel, m_directory, m_browse, m_open});
     }
