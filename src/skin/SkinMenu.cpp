@@ -487,10 +487,10 @@ void ImMenuBar::Measure() {
         const SkinRect& last = m_itemRects.back();
         SetSize(last.Right() + m_itemLeft + 2, last.Bottom() + m_marginTop);
     }
-    if (!m_popup) {
-        m_popup.reset(new ImMenuPopup(this, this, m_popupFont));
+    // The popup is a window of its own, made when a menu first opens, not with the bar.
+    if (m_popup) {
+        m_popup->SetPopupFont(m_popupFont);
     }
-    m_popup->SetPopupFont(m_popupFont);
     Refresh();
 }
 
@@ -531,9 +531,12 @@ int ImMenuBar::EntryAt(const wxPoint& point) const {
 }
 
 void ImMenuBar::OpenEntry(int index) {
-    if (!m_popup || !m_menu || index < 0 || index >= m_itemCount) {
+    if (!m_menu || index < 0 || index >= m_itemCount) {
         CloseMenus();
         return;
+    }
+    if (!m_popup) {
+        m_popup.reset(new ImMenuPopup(this, this, m_popupFont));
     }
     wxMenu* menu = m_menu->tops[static_cast<std::size_t>(index)].second.get();
     m_popup->ClosePopup();
