@@ -139,10 +139,10 @@ public:
         }
 
         // The start skin's pictures are decoded on a second core while the window is made.
+        wxInitAllImageHandlers();
         std::string skin = config.GetString("last_skin");
         ac::PrefetchSkinPictures(ac::g_Language.GetBaseDir() + "\\Skin\\" +
                                  ac::SkinNameOf(skin.empty() ? std::string("Default") : skin));
-        wxInitAllImageHandlers();
         auto* dialog = new ac::CAudioEncDlg();
         SetTopWindow(dialog);
         dialog->OnInitDialog();

@@ -44,6 +44,7 @@ bool EndsWithBmp(const std::string& name) {
 struct SkinPrefetch {
     std::thread worker;
     std::unordered_map<std::string, Bitmap24> pictures;
+    std::unordered_map<std::string, wxImage> pngs;  // through wx's handler, alpha kept
     ~SkinPrefetch() {
         if (worker.joinable()) {
             worker.join();
@@ -86,12 +87,22 @@ void PrefetchSkinPictures(const std::string& skinDir) {
     for (const ZipEntry& entry : archive->Entries()) {
         const std::string name = CacheKey(entry.name);
         if (name.size() > prefix.size() && name.compare(0, prefix.size(), prefix) == 0 &&
-            name.find('\\', prefix.size()) == std::string::npos && EndsWithBmp(name)) {
+            name.find('\\', prefix.size()) == std::string::npos &&
+            (EndsWithBmp(name) || EndsWithPng(name))) {
             paths.push_back(skinDir + "\\" + entry.name.substr(prefix.size()));
         }
     }
     prefetch.worker = std::thread([&prefetch, paths = std::move(paths)] {
         for (const std::string& path : paths) {
+            if (EndsWithPng(path)) {
+                // wx's image handlers may run on any thread; the image is handed over whole
+                // when the thread is joined.
+                wxImage image = LoadImageResource(path);
+                if (image.IsOk()) {
+                    prefetch.pngs.emplace(CacheKey(path), std::move(image));
+                }
+                continue;
+            }
             std::vector<unsigned char> bytes;
             if (!ReadResource(path, bytes)) {
                 continue;
@@ -173,7 +184,14 @@ SkinPicture LoadSkinPicture(const std::string& fileName) {
         picture.bitmap = wxBitmap(picture.image);
         prefetched.erase(ahead);
     } else if (EndsWithPng(fileName)) {
-        wxImage image = LoadImageResource(path);
+        std::unordered_map<std::string, wxImage>& pngs = Prefetched().pngs;
+        wxImage image;
+        if (auto png = pngs.find(CacheKey(path)); png != pngs.end()) {
+            image = png->second;
+            pngs.erase(png);
+        } else {
+            image = LoadImageResource(path);
+        }
         if (image.IsOk()) {
             picture.image = image;
             picture.bitmap = wxBitmap(image);

@@ -1,6 +1,6 @@
-// The start skin's BMPs decoded ahead on a thread of their own read exactly as the ones decoded
-// on demand, and the pictures the thread does not take (PNGs, other skins) load as ever. Runs
-// under xvfb-run.
+// The start skin's pictures decoded ahead on a thread of their own read exactly as the ones
+// decoded on demand (BMPs by the program's reader, PNGs with their alpha), and another skin's
+// pictures of the same names load as ever. Runs under xvfb-run.
 
 #include "../support/PackageDir.h"
 #include "../support/WxTestApp.h"
@@ -48,12 +48,16 @@ protected:
 TEST_F(SkinPrefetchTest, PicturesDecodedAheadMatchThoseDecodedOnDemand) {
     const wxImage odd = Gradient(13, 9);
     const wxImage wide = Gradient(40, 3);
+    wxImage glyph = Gradient(6, 5);
+    glyph.InitAlpha();
+    glyph.SetAlpha(0, 0, 0);
+    glyph.SetAlpha(5, 4, 128);
     WritePackage({{"skin/", ""},
                   {"skin/Default/", ""},
                   {"skin/Default/skin.ini", "[Main]\nName=Default\n"},
                   {"skin/Default/Odd.bmp", Encoded(odd, wxBITMAP_TYPE_BMP)},
                   {"skin/Default/wide.bmp", Encoded(wide, wxBITMAP_TYPE_BMP)},
-                  {"skin/Default/glyph.png", Encoded(odd, wxBITMAP_TYPE_PNG)},
+                  {"skin/Default/glyph.png", Encoded(glyph, wxBITMAP_TYPE_PNG)},
                   {"skin/Other/", ""},
                   {"skin/Other/skin.ini", "[Main]\nName=Other\n"},
                   {"skin/Other/Odd.bmp", Encoded(wide, wxBITMAP_TYPE_BMP)}});
@@ -78,8 +82,12 @@ TEST_F(SkinPrefetchTest, PicturesDecodedAheadMatchThoseDecodedOnDemand) {
     EXPECT_EQ(0, memcmp(ahead.image.GetData(), odd.GetData(), 13 * 9 * 3));
     const SkinPicture wideAhead = LoadSkinPicture("wide.bmp");
     EXPECT_EQ(0, memcmp(wideAhead.image.GetData(), wide.GetData(), 40 * 3 * 3));
-    EXPECT_TRUE(LoadSkinPicture("glyph.png").image.HasAlpha() ||
-                LoadSkinPicture("glyph.png").IsOk());
+    const SkinPicture png = LoadSkinPicture("glyph.png");
+    ASSERT_TRUE(png.image.HasAlpha());
+    EXPECT_TRUE(png.fromPng);
+    EXPECT_EQ(png.image.GetAlpha(0, 0), 0);
+    EXPECT_EQ(png.image.GetAlpha(5, 4), 128);
+    EXPECT_EQ(0, memcmp(png.image.GetData(), glyph.GetData(), 6 * 5 * 3));
     // The other skin's picture of the same name is its own, not the one decoded ahead.
     ASSERT_TRUE(g_Skin.SetSkin("Other"));
     EXPECT_EQ(LoadSkinPicture("Odd.bmp").Width(), 40);
