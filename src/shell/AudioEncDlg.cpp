@@ -137,6 +137,15 @@ void CAudioEncDlg::OnInitDialog() {
         });
     }
     SetMainHub(this);
+    {
+        // The boxes' colours are in force before the boxes are made: a style sheet that comes
+        // later makes GTK restyle every widget already there.
+        const std::string last = GetAppConfig().GetString("last_skin");
+        ImSkinConfig start(&g_Language);
+        if (start.Load(g_Skin.GetRoot() + "\\" + SkinNameOf(last.empty() ? "Default" : last))) {
+            ApplyNativeColours(start);
+        }
+    }
     ShowCaption(true);
     GetSkinMenuBar(true);
     CreatePanels();
@@ -375,18 +384,22 @@ void CAudioEncDlg::OnLanguageCommand() {
     Refresh();
 }
 
+// Entry fields and drop-down lists take the side bar's field and text colours, the ones its
+// property grid shows, wherever they stand.
+void CAudioEncDlg::ApplyNativeColours(const ImSkinConfig& skin) {
+    const int field = skin.GetInt("PropertyBgColor", 255, "SideBar");
+    SetNativeControlColours(
+        NativeColoursFor(field == 255 ? *wxWHITE : NativeColour(static_cast<std::uint32_t>(field)),
+                         NativeColour(skin.GetRgbColour("TextColor", 0, "SideBar"))));
+}
+
 bool CAudioEncDlg::OnSkinChanged(const std::string& skinDir) {
     ImSkinConfig skin(&g_Language);
     skin.Load(skinDir);
     m_sideBarWidth = skin.GetInt("Width", 200, "SideBar");
     m_checkRightMargin = skin.GetInt("RightMargin", 5, "Check");
     m_checkGapHeight = skin.GetInt("GapHeight", 27, "Check");
-    // Entry fields and drop-down lists take the side bar's field and text colours, the ones its
-    // property grid shows, wherever they stand.
-    const int field = skin.GetInt("PropertyBgColor", 255, "SideBar");
-    SetNativeControlColours(
-        NativeColoursFor(field == 255 ? *wxWHITE : NativeColour(static_cast<std::uint32_t>(field)),
-                         NativeColour(skin.GetRgbColour("TextColor", 0, "SideBar"))));
+    ApplyNativeColours(skin);
     const bool taken = ImSkinFrame::OnSkinChanged(skinDir);
     m_fileInfoBodyColour = m_skin.GetString("BodyBgColor", "#F3F6FA", "FileInfo");
     return taken;

@@ -96,6 +96,7 @@ private:
     enum Panel { MediaList, Creator, Output, Player, Rip, SideBar, Status, PanelCount };
 
     void CreatePanels();
+    void ApplyNativeColours(const class ImSkinConfig& skin);
     void EnsureFileInfoWindow();
     void LoadModeMenu(int mode);
     void FillSkinMenu(wxMenu& popup);

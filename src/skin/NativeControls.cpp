@@ -68,6 +68,12 @@ void FollowSkinColoursBelow(wxWindow* parent) {
 }
 
 void SetNativeControlColours(const NativeControlColours& colours) {
+    // A style sheet loaded again restyles every widget on the screen, even unchanged.
+    if (g_provider != nullptr && colours.background == g_colours.background &&
+        colours.text == g_colours.text && colours.border == g_colours.border &&
+        colours.disabledText == g_colours.disabledText) {
+        return;
+    }
     g_colours = colours;
     GdkScreen* screen = gdk_screen_get_default();
     if (screen == nullptr) {

@@ -268,6 +268,12 @@ TEST_F(MainWindowTest, ChangesOfSkinAndLanguageReachEveryWindow) {
     program.Send("close");
     ASSERT_TRUE(program.WaitForExit());
     EXPECT_NE(program.Settings().find("last_skin=sz:Midnight"), std::string::npos);
+
+    // The next start dresses the boxes dark from the first paint on.
+    Program again(m_home);
+    EXPECT_EQ(again.WaitShown().at("fields"), "#21262F/#E3E6EB");
+    again.Send("close");
+    ASSERT_TRUE(again.WaitForExit());
 }
 
 // A program folder of its own, with a data.pkg whose only skin is damaged in every way and
