@@ -120,6 +120,7 @@ void COutputPanelWnd::MakeBurnControls() {
         m_copies->ChangeValue(std::to_string(event.GetPosition()));
     });
     TranslateBurnLabels();
+    TranslateWindow(*this, kOutputPanelDialogId);
     DressBurnLabels();
 }
 
@@ -251,7 +252,6 @@ void COutputPanelWnd::TranslateBurnLabels() {
     m_recorderLabel->SetLabel("CD Recorder:");
     m_speedLabel->SetLabel("Burn Speed:");
     m_copiesLabel->SetLabel("Burn Copies:");
-    TranslateWindow(*this, kOutputPanelDialogId);
 }
 
 void COutputPanelWnd::DressBurnLabels() {
