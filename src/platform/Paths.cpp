@@ -1,6 +1,7 @@
 #include "platform/Paths.h"
 
 #include <sys/stat.h>
+#include <sys/statvfs.h>
 #include <unistd.h>
 
 #include <cerrno>
@@ -134,6 +135,16 @@ std::string UserConfigDirectory() {
 std::string MusicDirectory() {
     std::string music = MusicFromUserDirs();
     return music.empty() ? HomeDirectory() + "/Music" : music;
+}
+
+std::optional<std::uint64_t> FreeDiskBytes(const std::string& folder) {
+    struct stat info;
+    struct statvfs volume;
+    if (::stat(folder.c_str(), &info) != 0 || !S_ISDIR(info.st_mode) ||
+        ::statvfs(folder.c_str(), &volume) != 0) {
+        return std::nullopt;
+    }
+    return static_cast<std::uint64_t>(volume.f_bavail) * volume.f_frsize;
 }
 
 bool EnsureDirectory(const std::string& path, unsigned mode) {

@@ -5,6 +5,8 @@
 // Thread contract: any thread. Results are computed from the environment at each call, so a
 // test may point them elsewhere with setenv before it starts its work.
 
+#include <cstdint>
+#include <optional>
 #include <string>
 
 namespace ac::platform {
@@ -34,5 +36,15 @@ std::string FindConversionTool();
 // `mode` before the umask: 0700 for the program's own folders, 0777 for the user's (output
 // folders), which must look like any other folder the user makes.
 bool EnsureDirectory(const std::string& path, unsigned mode = 0700);
+
+// Bytes an unprivileged user may still write on the volume of `folder`; none when the folder
+// does not exist or its volume cannot be read.
+std::optional<std::uint64_t> FreeDiskBytes(const std::string& folder);
+
+// The rip and burn panels stop short of a full disk: a folder with less than 200 MB left.
+inline bool IsLowOnDiskSpace(const std::string& folder) {
+    const std::optional<std::uint64_t> free = folder.empty() ? std::nullopt : FreeDiskBytes(folder);
+    return free && *free < 209715200;
+}
 
 }  // namespace ac::platform

@@ -1,50 +1,35 @@
-#include "shell/Preferences.h"
 #include "shell/AudioEncDlg.h"
 
 #include "burn/ui/CDCreatorPanel.h"
 #include "cddb/ui/CddbWaitDlg.h"
-
 #include "medialist/ui/MediaListWnd.h"
 #include "medialist/ui/OutputPanelWnd.h"
 #include "panels/FileInfoWnd.h"
 #include "panels/PlayerWnd.h"
-#include "panels/ProgramDialogs.h"
 #include "panels/StatusWnd.h"
 #include "platform/DiscDevice.h"
-#include "platform/Paths.h"
-#include "profile/ui/ParameterGrid.h"
 #include "profile/ui/SaveProfileDlg.h"
 #include "profile/ui/SideBarWnd.h"
 #include "resources/Language.h"
+#include "rip/ui/RipPanel.h"
 #include "shell/AppConfig.h"
 #include "shell/BurnMode.h"
 #include "shell/Check.h"
 #include "shell/ConvertMode.h"
-#include "shell/MenuTables.h"
 #include "shell/MessageBoxes.h"
 #include "shell/PlayerLists.h"
 #include "shell/ProgramIcon.h"
 #include "shell/RipMode.h"
-#include "convert/RowParameters.h"
 #include "skin/NativeControls.h"
-#include "skin/ShutDownDlg.h"
-#include "skin/ChooseSkinDlg.h"
-#include "skin/ListCtrl.h"
 #include "skin/SkinBars.h"
 #include "skin/SkinMenu.h"
 #include "skin/UiQueueWx.h"
-#include "skin/WxTranslate.h"
 
-#include <wx/filename.h>
-#include <wx/msgdlg.h>
-#include <wx/textctrl.h>
 #include <wx/taskbar.h>
 #include <wx/time.h>
-#include <wx/utils.h>
 
 #include <algorithm>
 #include <sys/stat.h>
-#include <sstream>
 
 namespace ac {
 
@@ -52,14 +37,8 @@ CAudioEncDlg* g_MainDlg = nullptr;
 
 namespace {
 
-// Free space below which a burn stops: 200 MB.
-constexpr long long kLowDiskBytes = 209715200LL;
 constexpr int kPlayerHeight = 280;
 constexpr std::uint32_t kFilesRefusedDuringRunId = 0xC185;
-
-// afterconvert keeps 0 shut down, 1 standby, 2 hibernate, 3 exit, 4 none; the menu lists
-// No action, Shut Down, Hibernate, Standby, Kill me.
-constexpr int kAfterConvertOfCommand[5] = {4, 0, 2, 1, 3};
 
 }  // namespace
 
@@ -302,88 +281,6 @@ void CAudioEncDlg::SwitchMode(int mode) {
     RecalcLayout();
 }
 
-void CAudioEncDlg::LoadModeMenu(int mode) {
-    std::unique_ptr<ImMenu> menu = BuildModeMenu(mode);
-    if (wxMenu* drives = SelectCdRomPopup(*menu); drives != nullptr && m_rip) {
-        m_rip->FillDriveMenu(*drives);
-    }
-    if (wxMenu* options = OptionsPopup(*menu)) {
-        FillSkinMenu(*options->FindItemByPosition(0)->GetSubMenu());
-        FillLanguageMenu(*options->FindItemByPosition(1)->GetSubMenu());
-    }
-    TranslateMenuBar(*menu);
-    GetSkinMenuBar(true)->SetMenu(std::move(menu));
-    RecalcLayout();
-}
-
-void CAudioEncDlg::FillSkinMenu(wxMenu& popup) {
-    m_skinCommands.clear();
-    g_Skin.Enumerate();
-    int id = cmd::kFirstSkin;
-    for (int i = 0; i < g_Skin.GetSkinCount() && id <= cmd::kLastSkin; ++i) {
-        const std::string dir = g_Skin.GetSkinAt(i);
-        ImSkinConfig config(&g_Language);
-        if (!config.Load(dir)) {
-            continue;
-        }
-        wxMenuItem* item = popup.AppendCheckItem(id, wxString::FromUTF8(config.GetName()));
-        item->Check(wxString::FromUTF8(SkinNameOf(dir))
-                        .IsSameAs(wxString::FromUTF8(g_Skin.GetSkinName()), false));
-        m_skinCommands[id++] = dir;
-    }
-}
-
-void CAudioEncDlg::FillLanguageMenu(wxMenu& popup) {
-    m_languageCommands.clear();
-    for (int i = 0; i < g_Language.GetLanguageCount(); ++i) {
-        const std::string name = g_Language.GetLanguageAt(i);
-        const int id = cmd::kFirstLanguage + i;
-        wxMenuItem* item = popup.AppendCheckItem(id, wxString::FromUTF8(name));
-        item->Check(wxString::FromUTF8(name).IsSameAs(
-            wxString::FromUTF8(g_Language.GetLanguageName()), false));
-        m_languageCommands[id] = name;
-    }
-}
-
-void CAudioEncDlg::OnInitMenuPopup(wxMenu* menu) {
-    // The drives change under the menu (an image added, a disc found in another drive).
-    if (m_rip && GetWorkMode() == 1) {
-        if (wxMenuItem* entry = menu->FindItem(ripcmd::kAddDiscImage); entry && entry->GetMenu()) {
-            m_rip->FillDriveMenu(*entry->GetMenu());
-        }
-    }
-    ApplyEnableRules(*menu);
-    if (wxMenuItem* info = menu->FindChildItem(CFileInfoWnd::kCommandId);
-        info != nullptr && info->IsCheckable() && g_FileInfoWnd != nullptr) {
-        info->Check(g_FileInfoWnd->IsShown());
-    }
-    for (int id = cmd::kAfterFirst; id <= cmd::kAfterLast; ++id) {
-        if (wxMenuItem* item = menu->FindChildItem(id)) {
-            item->Check(kAfterConvertOfCommand[id - cmd::kAfterFirst] == m_afterConvert);
-        }
-    }
-}
-
-void CAudioEncDlg::OnLanguageChanged() {
-    m_check->OnLanguageChanged();
-    for (ImSkinPanel* panel : m_panels) {
-        if (panel != nullptr) {
-            panel->OnLanguageChanged();
-        }
-    }
-}
-
-void CAudioEncDlg::OnLanguageCommand() {
-    LoadModeMenu(GetWorkMode());
-    OnLanguageChanged();
-    if (g_FileInfoWnd != nullptr) {
-        g_FileInfoWnd->OnLanguageChanged();
-    }
-    // Skins may carry language variants of their pictures and keys.
-    g_Skin.SetSkin(g_Skin.GetSkinName());
-    Refresh();
-}
-
 // Entry fields and drop-down lists take the side bar's field and text colours, the ones its
 // property grid shows, wherever they stand.
 void CAudioEncDlg::ApplyNativeColours(const ImSkinConfig& skin) {
@@ -453,47 +350,24 @@ void CAudioEncDlg::OnTimer(wxTimerEvent& event) {
     if (event.GetId() != kDiskTimer) {
         return;
     }
-    const int mode = GetWorkMode();
-    if (mode == 0) {
-        if (m_convert) {
-            m_convert->CheckDiskSpace();
-        }
-        return;
+    // Each mode watches the folder it writes to.
+    switch (GetWorkMode()) {
+        case 0:
+            if (m_convert) {
+                m_convert->CheckDiskSpace();
+            }
+            break;
+        case 1:
+            if (m_rip) {
+                m_rip->CheckDiskSpace();
+            }
+            break;
+        default:
+            if (m_burn && !m_burn->CheckDiskSpace()) {
+                m_diskTimer.Stop();
+            }
+            break;
     }
-    const std::string path = GetAppConfig().GetString(mode == 2 ? "burntemp" : "OutputCDDir");
-    wxLongLong freeBytes;
-    if (!path.empty() && wxDirExists(wxString::FromUTF8(path)) &&
-        wxGetDiskSpace(wxString::FromUTF8(path), nullptr, &freeBytes) &&
-        freeBytes.GetValue() < kLowDiskBytes) {
-        // Stopping a run belongs to the mode's panel; with no run there is nothing to stop.
-        if (mode == 1 && g_RipDlg != nullptr && g_RipDlg->Driver().IsRunning()) {
-            g_RipDlg->Driver().StopRip(false);
-            AppMessageBox(g_Language.GetString(0xC000), wxOK | wxICON_ERROR, this);
-        }
-        if (mode == 2) {
-            m_diskTimer.Stop();
-        }
-    }
-}
-
-void CAudioEncDlg::ToTray() {
-    if (!m_tray) {
-        m_tray = MakeTrayIcon(this);
-    }
-    wxIcon icon;
-    icon.CopyFromBitmap(MakeProgramIcon(32));
-    m_tray->SetIcon(icon, m_check->Tab(GetWorkMode())->GetLabel());
-    m_bInTray = true;
-    Hide();
-}
-
-void CAudioEncDlg::FromTray() {
-    Show();
-    Raise();
-    if (m_tray) {
-        m_tray->RemoveIcon();
-    }
-    m_bInTray = false;
 }
 
 bool CAudioEncDlg::RunStopLogic() {
@@ -535,30 +409,7 @@ void CAudioEncDlg::OnClose(wxCloseEvent& event) {
 
 void CAudioEncDlg::OnCommand(wxCommandEvent& event) {
     const int id = event.GetId();
-    if (auto skin = m_skinCommands.find(id); skin != m_skinCommands.end()) {
-        g_Skin.SetSkin(skin->second);
-        LoadModeMenu(GetWorkMode());
-        return;
-    }
-    if (auto language = m_languageCommands.find(id); language != m_languageCommands.end()) {
-        if (g_Language.SelectLanguage(language->second)) {
-            GetAppConfig().SetString("language", g_Language.GetLanguageName().c_str());
-        }
-        OnLanguageCommand();
-        return;
-    }
-    if (id >= cmd::kAfterFirst && id <= cmd::kAfterLast) {
-        m_afterConvert = kAfterConvertOfCommand[id - cmd::kAfterFirst];
-        GetAppConfig().SetInt("afterconvert", m_afterConvert);
-        if (m_convert) {
-            m_convert->SetAfterConvertAction(m_afterConvert);
-        }
-        if (m_rip) {
-            m_rip->SetAfterRunAction(m_afterConvert);
-        }
-        if (m_burn) {
-            m_burn->SetAfterRunAction(m_afterConvert);
-        }
+    if (OnProgramCommand(id)) {
         return;
     }
     // Show File Information serves every mode: the window shows whatever row it was given.
@@ -587,59 +438,8 @@ void CAudioEncDlg::OnCommand(wxCommandEvent& event) {
     if (g_PlayerWnd != nullptr && g_PlayerWnd->OnCommand(id)) {
         return;
     }
-    switch (id) {
-        case cmd::kExit:
-            Close();
-            return;
-        case cmd::kBackground:
-            ToTray();
-            return;
-        case cmd::kTrayOpen:
-            FromTray();
-            return;
-        case cmd::kTrayExit:
-            Close();
-            return;
-        case cmd::kChooseSkinDialog: {
-            ImChooseSkinDlg dialog(this);
-            dialog.ShowModal();
-            LoadModeMenu(GetWorkMode());
-            return;
-        }
-        case cmd::kPreferences: {
-            CPreferencesSheet sheet(this, [this] { OnPreferencesApplied(); });
-            sheet.ShowModal();
-            return;
-        }
-        case cmd::kContents:
-            OpenHelpPage(GetAppConfig().GetBaseDirectory() + "/help/Default.htm", this);
-            return;
-        case cmd::kSupport:
-            wxLaunchDefaultBrowser("https://velmorant.example/support");
-            return;
-        case cmd::kAbout: {
-            ShowAboutDialog(this, GetAppConfig().GetBaseDirectory() + "/help/velmorantabout.jpg");
-            return;
-        }
-        default:
-            // Commands of the list panels arrive here once those panels exist.
-            event.Skip();
-            return;
-    }
-}
-
-void CAudioEncDlg::OnPreferencesApplied() {
-    m_afterConvert = GetAppConfig().GetInt("afterconvert");
-    if (m_convert) {
-        m_convert->SetAfterConvertAction(m_afterConvert);
-        m_convert->ReloadSettings();
-    }
-    if (m_rip) {
-        m_rip->SetAfterRunAction(m_afterConvert);
-    }
-    if (g_RipDlg != nullptr) {
-        g_RipDlg->ReadSettings();
-    }
+    // Commands of the list panels arrive here once those panels exist.
+    event.Skip();
 }
 
 void CAudioEncDlg::OpenFiles(const std::vector<std::string>& paths) {

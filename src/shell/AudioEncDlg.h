@@ -98,11 +98,14 @@ private:
     void CreatePanels();
     void ApplyNativeColours(const class ImSkinConfig& skin);
     void EnsureFileInfoWindow();
+    // The mode's menu bar (AudioEncMenus.cpp).
     void LoadModeMenu(int mode);
     void FillSkinMenu(wxMenu& popup);
     void FillLanguageMenu(wxMenu& popup);
     void ShowModePanel(int mode);
     void OnCommand(wxCommandEvent& event);
+    // Skins, languages, the after-run action, the tray, preferences and help (AudioEncMenus.cpp).
+    bool OnProgramCommand(int id);
     void DispatchCommand(int id);
     void ApplyEnableRules(wxMenu& menu);
     void HandOverSelectedSets();

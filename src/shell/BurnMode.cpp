@@ -5,6 +5,7 @@
 #include "panels/FileAddErrorWnd.h"
 #include "panels/ProgramDialogs.h"
 #include "panels/StatusWnd.h"
+#include "platform/Paths.h"
 #include "platform/UiQueue.h"
 #include "profile/ui/SideBarWnd.h"
 #include "shell/AppConfig.h"
@@ -27,6 +28,10 @@ CBurnMode::CBurnMode(wxWindow* mainWindow, CCDCreatorPanel& panel)
     m_panel.FillRecorderBox();
     m_afterRunAction = GetAppConfig().GetInt("afterconvert");
     m_panel.RefreshCapacity();
+}
+
+bool CBurnMode::CheckDiskSpace() {
+    return !platform::IsLowOnDiskSpace(GetAppConfig().GetString("burntemp"));
 }
 
 bool CBurnMode::IsOwnCommand(int commandId) const {

@@ -20,6 +20,8 @@ public:
     bool OnCommand(int commandId);
     bool IsCommandEnabled(int commandId);
     bool StopForClose() { return m_panel.StopForClose(); }
+    // False once the folder of the burn's temporary files is down to its last 200 MB.
+    bool CheckDiskSpace();
     bool IsRunActive() { return m_panel.Driver().BurnActive(); }
     // The tab has come to the front: the status bar becomes the disc's gauge.
     void RefreshGauge() { m_panel.RefreshCapacity(); }

@@ -2,6 +2,7 @@
 
 #include "panels/ProgramDialogs.h"
 #include "panels/StatusWnd.h"
+#include "platform/Paths.h"
 #include "platform/UiQueue.h"
 #include "profile/ui/SideBarWnd.h"
 #include "resources/Language.h"
@@ -16,9 +17,23 @@
 
 namespace ac {
 
+namespace {
+
+constexpr std::uint32_t kNotEnoughSpaceId = 0xC000;
+
+}  // namespace
+
 CRipMode::CRipMode(wxWindow* mainWindow, CDRipDlg& panel) : m_mainWindow(mainWindow), m_panel(panel) {
     m_panel.SetModeHost(this);
     m_afterRunAction = GetAppConfig().GetInt("afterconvert");
+}
+
+void CRipMode::CheckDiskSpace() {
+    if (m_panel.Driver().IsRunning() &&
+        platform::IsLowOnDiskSpace(GetAppConfig().GetString("OutputCDDir"))) {
+        m_panel.Driver().StopRip(false);
+        AppMessageBox(g_Language.GetString(kNotEnoughSpaceId), wxOK | wxICON_ERROR, m_mainWindow);
+    }
 }
 
 bool CRipMode::IsOwnCommand(int commandId) const {

@@ -23,6 +23,8 @@ public:
     bool IsCommandEnabled(int commandId);
     // The close request in mode 1, and any time a run exists: false when the user refused.
     bool StopForClose();
+    // Stops a rip, and says why, when the output folder is down to its last 200 MB.
+    void CheckDiskSpace();
     void SetAfterRunAction(int action) { m_afterRunAction = action; }
     // Select CD Rom: one entry per drive, the current one checked, then Add Disc Image.
     void FillDriveMenu(wxMenu& popup);
