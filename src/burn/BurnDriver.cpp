@@ -5,7 +5,6 @@
 #include "platform/CommandLine.h"
 #include "platform/Paths.h"
 
-#include <sys/statvfs.h>
 #include <unistd.h>
 
 #include <algorithm>
@@ -20,11 +19,9 @@ namespace {
 namespace fs = std::filesystem;
 using namespace std::chrono_literals;
 
+// A temporary folder that cannot be read has no room for the burn's files.
 std::uint64_t FreeBytes(const std::string& folder) {
-    struct statvfs volume;
-    if (::statvfs(folder.c_str(), &volume) != 0)
-        return 0;
-    return static_cast<std::uint64_t>(volume.f_bavail) * volume.f_frsize;
+    return platform::FreeDiskBytes(folder).value_or(0);
 }
 
 bool IsFinal(JobStatus status) {
